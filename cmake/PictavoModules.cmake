@@ -32,7 +32,9 @@ function(pictavo_module name)
 endfunction()
 
 # pictavo_test_area(DIR): every tests/DIR/*.cpp forms one GoogleTest program
-# "test_DIR", run headless on the buffer engine by CTest.
+# "test_DIR", run headless on the buffer engine by CTest. It links the rung of
+# the same name (tests/model links pictavo_model) or, if none, the whole app,
+# so a rung's tests build without the rungs below it.
 function(pictavo_test_area dir)
   file(GLOB sources CONFIGURE_DEPENDS ${CMAKE_CURRENT_SOURCE_DIR}/${dir}/*.cpp)
   if(NOT sources)
@@ -41,7 +43,12 @@ function(pictavo_test_area dir)
   set(target test_${dir})
   string(REPLACE "-" "_" target ${target})
   add_executable(${target} ${sources})
-  target_link_libraries(${target} PRIVATE pictavo_test_support pictavo_app)
+  set(rung pictavo_${dir})
+  string(REPLACE "-" "" rung ${rung})
+  if(NOT TARGET ${rung})
+    set(rung pictavo_app)
+  endif()
+  target_link_libraries(${target} PRIVATE pictavo_test_support ${rung})
   add_test(NAME ${dir} COMMAND ${target})
   set_tests_properties(${dir} PROPERTIES TIMEOUT 600
     ENVIRONMENT "ELM_ENGINE=buffer;ECORE_NO_SYSTEM_MODULES=1;EINA_LOG_BACKTRACE=-1;PICTAVO_LOG_LEVEL=E;PICTAVO_RES_DIR=${PICTAVO_RES_BUILD_DIR};PICTAVO_TEST_DATA=${CMAKE_CURRENT_BINARY_DIR}/data;HOME=${CMAKE_CURRENT_BINARY_DIR}/home;XDG_DATA_HOME=${CMAKE_CURRENT_BINARY_DIR}/home/data;XDG_PICTURES_DIR=${CMAKE_CURRENT_BINARY_DIR}/home/Pictures;ASAN_OPTIONS=detect_leaks=0")
