@@ -1,24 +1,48 @@
-#include <Elementary.h>
+#include <string>
 
+#include "app-assist/WApp.h"
+#include "app-assist/WContentViewController.h"
+#include "app-assist/WNaviframeController.h"
+#include "app-assist/WWindowController.h"
+#include "app-entry/CLyRenderCommand.h"
 #include "common/CLyLog.h"
+#include "platform/app.h"
 
-// Placeholder entry point until the application object exists: opens the
-// "pictavo" window with a naviframe and quits on window close.
+namespace {
+
+// Until the collage screens exist: the "pictavo" window with a naviframe
+// holding one placeholder page; backing out of the last page ends the
+// program.
+class PlaceholderApp : public app_assist::WApp {
+ protected:
+  bool onCreate() override {
+    auto* window = new app_assist::WWindowController("pictavo", ELM_WIN_BASIC);
+    if (!attachWindowController(window)) {
+      LYLOG_E("Failed to create the window");
+      return false;
+    }
+    auto* naviframe = new app_assist::WNaviframeController();
+    naviframe->setOnLastItemPop([](bool* popOut) {
+      *popOut = false;
+      ui_app_exit();
+    });
+    if (!window->attachBaseViewController(naviframe)) return false;
+    auto* page = new app_assist::WContentViewController("pictavo");
+    page->setTitle("Pictavo");
+    return naviframe->push(page);
+  }
+};
+
+}  // namespace
+
 int main(int argc, char** argv) {
-  elm_init(argc, argv);
-  elm_policy_set(ELM_POLICY_QUIT, ELM_POLICY_QUIT_LAST_WINDOW_CLOSED);
-  Evas_Object* win = elm_win_util_standard_add("pictavo", "pictavo");
-  Evas_Object* navi = elm_naviframe_add(win);
-  evas_object_size_hint_weight_set(navi, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
-  elm_win_resize_object_add(win, navi);
-  evas_object_show(navi);
-  Evas_Object* label = elm_label_add(navi);
-  elm_object_text_set(label, "Pictavo");
-  elm_naviframe_item_push(navi, "Pictavo", nullptr, nullptr, label, nullptr);
-  evas_object_resize(win, 720, 1280);
-  evas_object_show(win);
-  LYLOG_I("window opened");
-  elm_run();
-  elm_shutdown();
-  return 0;
+  // The headless render command never starts the application.
+  if (argc > 1 && std::string(argv[1]) == "--render") return runRenderCommand(argc, argv);
+  int result;
+  {
+    PlaceholderApp app;
+    result = app.run(argc, argv);
+  }
+  LYLOG_W("app return=%d", result);
+  return result;
 }

@@ -15,6 +15,9 @@ namespace BitmapFactory {
 // Any image whose header claims more pixels than this is refused before
 // anything is allocated for it.
 constexpr long long kMaxImagePixels = 100000000LL;
+// Nor is any image wider or higher than this (the JPEG and GIF limit), which
+// keeps every row buffer of a decoder small.
+constexpr long long kMaxImageSide = 65535;
 // decodeFile targets must lie in 1..kMaxDecodeSide - 1 on each side.
 constexpr int kMaxDecodeSide = 3000;
 

@@ -7,6 +7,8 @@
 
 #include <cstdlib>
 #include <cstring>
+#include <filesystem>
+#include <system_error>
 
 #include "common/CLyLog.h"
 
@@ -57,6 +59,11 @@ bool gElmUp = false;
 
 void ensureElm() {
   if (gElmUp) return;
+  // elm_init needs the private HOME that CTest points at to exist.
+  if (const char* home = getenv("HOME")) {
+    std::error_code ignored;
+    std::filesystem::create_directories(home, ignored);
+  }
   setenv("ELM_ENGINE", "buffer", 0);
   setenv("ECORE_NO_SYSTEM_MODULES", "1", 0);
   static char arg0[] = "pictavo-test";

@@ -1,0 +1,11 @@
+#pragma once
+// Object data keys through which controllers are found from Evas objects.
+
+namespace app_assist {
+
+constexpr const char kWindowInstanceKey[] = "__@WWindowInstance";
+constexpr const char kBaseLayoutTagKey[] = "__@WBaselayoutTag";
+constexpr const char kViewInstanceKey[] = "__@WViewInstance";
+constexpr const char kNaviframeInstanceKey[] = "__@WNaviframeInstance";
+
+}  // namespace app_assist

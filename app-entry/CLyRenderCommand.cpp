@@ -1,0 +1,285 @@
+#include "app-entry/CLyRenderCommand.h"
+
+#include <Elementary.h>
+
+#include <cerrno>
+#include <climits>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "app-assist/WWindowController.h"
+#include "codec/Bitmap.h"
+#include "common/CLyLog.h"
+#include "control/CLyMultiGrid.h"
+#include "control/CLyMultiGridSaver.h"
+#include "model/CLyImageDecoderThread.h"
+#include "model/ILyMultiGridListener.h"
+#include "model/CLyMultiGridDrawRectList.h"
+#include "model/CLyMultiGridSrcItem.h"
+#include "model/CLyMultiGridSrcItemList.h"
+#include "model/style/CLyMultiGridStyleManager.h"
+
+namespace {
+
+const int kMinPhotos = 2;
+const int kMaxPhotos = 6;
+const int kSaveLimit = 2000;
+
+struct Options {
+  std::string out;
+  int layout = 0;
+  int ratio = LY_RATIO_1_1;
+  int margin = 1;
+  int roundness = 0;
+  CLyRectangle background{255, 255, 255, 255};
+  int screenW = 1080, screenH = 1920;
+  std::vector<std::string> photos;
+};
+
+void usage() {
+  fprintf(stderr,
+          "usage: pictavo --render OUT.jpg [--layout N] [--ratio 1:1|3:4|9:16] [--margin 0-10]\n"
+          "                [--roundness 0-10] [--background '#RRGGBB'] [--screen WxH] PHOTO...\n"
+          "  2 to 6 photos; --layout is the layout index for that many photos, from 0\n"
+          "  (2 photos: 0-1, 3: 0-5, 4: 0-8, 5: 0-7, 6: 0-6); defaults: layout 0, ratio 1:1,\n"
+          "  margin 1, roundness 0, background #FFFFFF, screen 1080x1920.\n");
+}
+
+bool parseInt(const char* text, int lo, int hi, int& out) {
+  if (!text || !*text) return false;
+  char* end = nullptr;
+  errno = 0;
+  long v = strtol(text, &end, 10);
+  if (errno || *end || v < lo || v > hi) return false;
+  out = (int)v;
+  return true;
+}
+
+bool parseColor(const char* text, CLyRectangle& out) {
+  if (!text || text[0] != '#' || strlen(text) != 7) return false;
+  for (int i = 1; i < 7; i++)
+    if (!isxdigit((unsigned char)text[i])) return false;
+  unsigned long v = strtoul(text + 1, nullptr, 16);
+  out.set((int)((v >> 16) & 0xFF), (int)((v >> 8) & 0xFF), (int)(v & 0xFF), 255);
+  return true;
+}
+
+bool parseSize(const char* text, int& w, int& h) {
+  if (!text) return false;
+  const char* x = strchr(text, 'x');
+  if (!x) return false;
+  std::string ws(text, x - text);
+  return parseInt(ws.c_str(), 16, 8192, w) && parseInt(x + 1, 16, 8192, h);
+}
+
+// Returns -1 on success, else the exit status.
+int parseArgs(int argc, char** argv, Options& o) {
+  if (argc < 3 || argv[2][0] == '-') {
+    fprintf(stderr, "pictavo: --render needs the output file first\n");
+    usage();
+    return LY_RENDER_USAGE;
+  }
+  o.out = argv[2];
+  for (int i = 3; i < argc; i++) {
+    const std::string a = argv[i];
+    if (a.size() > 2 && a.compare(0, 2, "--") == 0) {
+      const char* v = i + 1 < argc ? argv[i + 1] : nullptr;
+      bool ok = v != nullptr;
+      if (a == "--layout") {
+        ok = ok && parseInt(v, 0, 99, o.layout);
+      } else if (a == "--ratio") {
+        std::string r = v ? v : "";
+        if (r == "1:1")
+          o.ratio = LY_RATIO_1_1;
+        else if (r == "3:4")
+          o.ratio = LY_RATIO_3_4;
+        else if (r == "9:16")
+          o.ratio = LY_RATIO_9_16;
+        else
+          ok = false;
+      } else if (a == "--margin") {
+        ok = ok && parseInt(v, 0, 10, o.margin);
+      } else if (a == "--roundness") {
+        ok = ok && parseInt(v, 0, 10, o.roundness);
+      } else if (a == "--background") {
+        ok = ok && parseColor(v, o.background);
+      } else if (a == "--screen") {
+        ok = ok && parseSize(v, o.screenW, o.screenH);
+      } else {
+        fprintf(stderr, "pictavo: unknown option %s\n", a.c_str());
+        usage();
+        return LY_RENDER_USAGE;
+      }
+      if (!ok) {
+        fprintf(stderr, "pictavo: bad value for %s: %s\n", a.c_str(), v ? v : "(missing)");
+        usage();
+        return LY_RENDER_USAGE;
+      }
+      i++;
+    } else {
+      o.photos.push_back(a);
+    }
+  }
+  if (o.photos.size() < (size_t)kMinPhotos || o.photos.size() > (size_t)kMaxPhotos) {
+    fprintf(stderr, "pictavo: a collage takes %d to %d photos, %zu given\n", kMinPhotos, kMaxPhotos,
+            o.photos.size());
+    usage();
+    return LY_RENDER_USAGE;
+  }
+  const size_t dot = o.out.rfind('.');
+  std::string ext = dot == std::string::npos ? "" : o.out.substr(dot);
+  for (char& c : ext) c = (char)tolower((unsigned char)c);
+  if (ext != ".jpg" && ext != ".jpeg") {
+    fprintf(stderr, "pictavo: the output must be a .jpg file: %s\n", o.out.c_str());
+    return LY_RENDER_USAGE;
+  }
+  return -1;
+}
+
+// Collects the decoder threads' results (called on the worker threads).
+class DecodeResults : public ILyMultiGridListener {
+ public:
+  explicit DecodeResults(size_t n) : mBitmaps(n, nullptr) {}
+  ~DecodeResults() override {
+    for (Bitmap* b : mBitmaps) delete b;
+  }
+  void onInvalidateMultiGrid(int index, Bitmap* bitmap) override {
+    std::lock_guard<std::mutex> lock(mMutex);
+    if (index < 0 || (size_t)index >= mBitmaps.size()) {
+      delete bitmap;
+      return;
+    }
+    delete mBitmaps[index];
+    mBitmaps[index] = bitmap;
+  }
+  Bitmap* take(size_t i) {
+    std::lock_guard<std::mutex> lock(mMutex);
+    Bitmap* b = mBitmaps[i];
+    mBitmaps[i] = nullptr;
+    return b;
+  }
+
+ private:
+  std::mutex mMutex;
+  std::vector<Bitmap*> mBitmaps;
+};
+
+// Decodes every photo on its own thread, bounded by the screen size ordered
+// so that width <= height, like the main view.
+void decodePhotos(const Options& o, DecodeResults& results) {
+  const float maxW = (float)std::min(o.screenW, o.screenH), maxH = (float)std::max(o.screenW, o.screenH);
+  std::vector<std::unique_ptr<CLyImageDecoderThread>> threads;
+  for (size_t i = 0; i < o.photos.size(); i++) {
+    auto t = std::make_unique<CLyImageDecoderThread>();
+    t->setMaxDecodingSize(maxW, maxH);
+    t->set((int)i, o.photos[i], &results);
+    threads.push_back(std::move(t));
+  }
+  for (auto& t : threads) t->start();
+  threads.clear();  // joins every thread
+}
+
+int render(const Options& o) {
+  DecodeResults results(o.photos.size());
+  decodePhotos(o, results);
+
+  CLyMultiGridSrcItemList items;
+  for (size_t i = 0; i < o.photos.size(); i++) {
+    Bitmap* bitmap = results.take(i);
+    if (!bitmap) {
+      fprintf(stderr, "pictavo: skipping %s: not a photo that can be decoded\n", o.photos[i].c_str());
+      continue;
+    }
+    CLyMultiGridSrcItem* item = new (std::nothrow) CLyMultiGridSrcItem();
+    if (!item) {
+      delete bitmap;
+      fprintf(stderr, "pictavo: out of memory\n");
+      return LY_RENDER_FAILED;
+    }
+    item->setPath(o.photos[i]);
+    item->setBitmap(bitmap, true);
+    items.add(item);
+  }
+  const int count = items.count();
+  if (count < kMinPhotos) {
+    fprintf(stderr, "pictavo: a collage needs at least %d usable photos, %d could be decoded\n", kMinPhotos,
+            count);
+    items.clear(true);
+    return LY_RENDER_NO_PHOTOS;
+  }
+
+  CLyMultiGridStyleManager* styles = &CLyMultiGridStyleManager::getInstance();
+  if (styles->getGridLayoutCount(count) == 0 && !styles->initialize()) {
+    fprintf(stderr, "pictavo: the layout styles could not be read\n");
+    items.clear(true);
+    return LY_RENDER_FAILED;
+  }
+  const int layouts = styles->getGridLayoutCount(count);
+  if (o.layout >= layouts) {
+    fprintf(stderr, "pictavo: %d photos have layouts 0 to %d, not %d\n", count, layouts - 1, o.layout);
+    items.clear(true);
+    return LY_RENDER_USAGE;
+  }
+  float rects[6][4] = {};
+  styles->getDrawRects(count, o.ratio, o.layout, rects);
+  CLyMultiGridDrawRectList cells;
+  for (int i = 0; i < count; i++)
+    cells.addItem(new CLyFloatRectangle(rects[i][0], rects[i][1], rects[i][2], rects[i][3]));
+  cells.setStyleIndex(o.layout);
+
+  // A window controller on the buffer engine: the collage control lives in
+  // a window like in the application, but nothing is shown.
+  auto* window = new app_assist::WWindowController("pictavo-render");
+  if (!window->precreate()) {
+    fprintf(stderr, "pictavo: no canvas could be created\n");
+    cells.clear(true);
+    items.clear(true);
+    return LY_RENDER_FAILED;
+  }
+  CLyMultiGridSaveRequest request;
+  request.cells = &cells;
+  request.items = &items;
+  request.ratio = o.ratio;
+  request.margin = o.margin;
+  request.roundness = o.roundness;
+  request.background = o.background;
+  request.limit = kSaveLimit;
+  int w = 0, h = 0;
+  Evas_Object* parent = window->getBaseLayout() ? window->getBaseLayout() : window->getEvasObj();
+  const bool saved = CLyMultiGridSaver::save(window->getEvasObj(), parent, request, o.out, &w, &h);
+  window->destroy();
+  cells.clear(true);
+  items.clear(true);
+  if (!saved) {
+    fprintf(stderr, "pictavo: the collage could not be written to %s (see the log above)\n", o.out.c_str());
+    return LY_RENDER_FAILED;
+  }
+  char* real = realpath(o.out.c_str(), nullptr);
+  printf("Collage of %d photos (%d x %d) saved to %s\n", count, w, h, real ? real : o.out.c_str());
+  free(real);
+  return LY_RENDER_OK;
+}
+
+}  // namespace
+
+int runRenderCommand(int argc, char** argv) {
+  Options o;
+  int status = parseArgs(argc, argv, o);
+  if (status >= 0) return status;
+  // Headless whatever the environment: the picture goes to a file only.
+  setenv("ELM_ENGINE", "buffer", 1);
+  setenv("ECORE_NO_SYSTEM_MODULES", "1", 0);
+  setenv("EINA_LOG_BACKTRACE", "-1", 0);
+  if (!elm_init(argc, argv)) {
+    fprintf(stderr, "pictavo: the toolkit could not start\n");
+    return LY_RENDER_FAILED;
+  }
+  status = render(o);
+  elm_shutdown();
+  return status;
+}

@@ -1,0 +1,178 @@
+// JPEG through libjpeg-turbo. The DCT scales the image down by M/8 while
+// decoding; the smallest scale still at least the target size is chosen, and
+// the Resampler brings it to the exact size. A 12 MP photo for a phone
+// screen is thus decoded at a quarter of its size, and the full-size image
+// never exists in memory.
+
+#include <csetjmp>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <new>
+
+#include <jpeglib.h>
+
+#include "codec/CodecLog.h"
+#include "codec/ImageDecoders.h"
+#include "codec/Resampler.h"
+
+namespace BitmapFactory {
+namespace {
+
+// A corrupt progressive file may carry thousands of tiny scans, each making
+// the decoder pass over the whole coefficient buffer; no real encoder writes
+// more than a few dozen.
+constexpr int kMaxScans = 500;
+// Working memory libjpeg may take (the coefficient buffer of a progressive
+// image is the large part: about 72 MB for 24 MP at 4:2:0).
+constexpr long kMaxDecoderMemory = 400L * 1024 * 1024;
+
+struct ErrorManager {
+  jpeg_error_mgr pub;
+  jmp_buf jump;
+};
+
+void errorExit(j_common_ptr cinfo) {
+  char message[JMSG_LENGTH_MAX];
+  (*cinfo->err->format_message)(cinfo, message);
+  IVLOG_E("libjpeg: %s", message);
+  longjmp(reinterpret_cast<ErrorManager*>(cinfo->err)->jump, 1);
+}
+
+void outputMessage(j_common_ptr cinfo) {
+  char message[JMSG_LENGTH_MAX];
+  (*cinfo->err->format_message)(cinfo, message);
+  IVLOG_D("libjpeg: %s", message);
+}
+
+void progress(j_common_ptr cinfo) {
+  if (!cinfo->is_decompressor) return;
+  auto* dinfo = reinterpret_cast<j_decompress_ptr>(cinfo);
+  if (dinfo->input_scan_number > kMaxScans) {
+    IVLOG_E("more than %d scans", kMaxScans);
+    longjmp(reinterpret_cast<ErrorManager*>(cinfo->err)->jump, 1);
+  }
+}
+
+// Everything that must be released after a longjmp lives here, on the heap,
+// so that no C++ object with a destructor is skipped over.
+struct JpegJob {
+  jpeg_decompress_struct cinfo;
+  ErrorManager err;
+  jpeg_progress_mgr progress;
+  bool created = false;
+  Resampler* resampler = nullptr;
+  uint8_t* rows = nullptr;
+  uint8_t* converted = nullptr;
+  ~JpegJob() {
+    if (created) jpeg_destroy_decompress(&cinfo);
+    delete resampler;
+    free(rows);
+    free(converted);
+  }
+};
+
+void setUp(JpegJob& job, FILE* file) {
+  job.cinfo.err = jpeg_std_error(&job.err.pub);
+  job.err.pub.error_exit = errorExit;
+  job.err.pub.output_message = outputMessage;
+  jpeg_create_decompress(&job.cinfo);
+  job.created = true;
+  job.cinfo.mem->max_memory_to_use = kMaxDecoderMemory;
+  job.progress.progress_monitor = progress;
+  job.cinfo.progress = &job.progress;
+  jpeg_stdio_src(&job.cinfo, file);
+}
+
+// Adobe CMYK/YCCK files store inverted inks; K scales the other three.
+void cmykToBgra(const uint8_t* src, uint8_t* dst, int width, bool inverted) {
+  for (int x = 0; x < width; ++x, src += 4, dst += 4) {
+    int c = src[0], m = src[1], y = src[2], k = src[3];
+    if (!inverted) {
+      c = 255 - c;
+      m = 255 - m;
+      y = 255 - y;
+      k = 255 - k;
+    }
+    dst[0] = static_cast<uint8_t>((y * k + 127) / 255);
+    dst[1] = static_cast<uint8_t>((m * k + 127) / 255);
+    dst[2] = static_cast<uint8_t>((c * k + 127) / 255);
+    dst[3] = 255;
+  }
+}
+
+}  // namespace
+
+bool readJpegSize(FILE* file, long long& width, long long& height) {
+  JpegJob* job = new (std::nothrow) JpegJob();
+  if (!job) return false;
+  volatile bool ok = false;
+  if (setjmp(job->err.jump) == 0) {
+    setUp(*job, file);
+    jpeg_read_header(&job->cinfo, TRUE);
+    width = job->cinfo.image_width;
+    height = job->cinfo.image_height;
+    ok = true;
+  }
+  delete job;
+  return ok;
+}
+
+bool decodeJpeg(FILE* file, int outW, int outH, uint8_t* out) {
+  JpegJob* job = new (std::nothrow) JpegJob();
+  if (!job) return false;
+  volatile bool ok = false;
+  if (setjmp(job->err.jump) == 0) {
+    setUp(*job, file);
+    jpeg_decompress_struct& cinfo = job->cinfo;
+    jpeg_read_header(&cinfo, TRUE);
+    if (!imageSizeAcceptable(cinfo.image_width, cinfo.image_height)) {
+      IVLOG_E("refused %u x %u", cinfo.image_width, cinfo.image_height);
+      delete job;
+      return false;
+    }
+    const bool cmyk = cinfo.jpeg_color_space == JCS_CMYK || cinfo.jpeg_color_space == JCS_YCCK;
+    cinfo.out_color_space = cmyk ? JCS_CMYK : JCS_EXT_BGRA;
+    cinfo.scale_denom = 8;
+    for (unsigned m = 1; m <= 8; ++m) {
+      cinfo.scale_num = m;
+      jpeg_calc_output_dimensions(&cinfo);
+      if (cinfo.output_width >= static_cast<unsigned>(outW) && cinfo.output_height >= static_cast<unsigned>(outH))
+        break;
+    }
+    jpeg_start_decompress(&cinfo);
+    const int w = static_cast<int>(cinfo.output_width);
+    const int h = static_cast<int>(cinfo.output_height);
+    const int batch = cinfo.rec_outbuf_height > 0 ? cinfo.rec_outbuf_height : 1;
+    job->resampler = new (std::nothrow) Resampler(w, h, outW, outH, out);
+    job->rows = static_cast<uint8_t*>(malloc(static_cast<size_t>(w) * 4 * batch));
+    if (cmyk) job->converted = static_cast<uint8_t*>(malloc(static_cast<size_t>(w) * 4));
+    if (!job->resampler || !job->resampler->ok() || !job->rows || (cmyk && !job->converted)) {
+      IVLOG_E("no memory for a %d x %d decode", w, h);
+      delete job;
+      return false;
+    }
+    JSAMPROW pointers[16];
+    for (int i = 0; i < batch && i < 16; ++i) pointers[i] = job->rows + static_cast<size_t>(i) * w * 4;
+    while (cinfo.output_scanline < cinfo.output_height) {
+      const int got = static_cast<int>(jpeg_read_scanlines(&cinfo, pointers, batch < 16 ? batch : 16));
+      if (got <= 0) break;
+      for (int i = 0; i < got; ++i) {
+        if (cmyk) {
+          cmykToBgra(pointers[i], job->converted, w, cinfo.saw_Adobe_marker);
+          job->resampler->pushRow(job->converted);
+        } else {
+          job->resampler->pushRow(pointers[i]);
+        }
+      }
+    }
+    job->resampler->finish();
+    // The rest of the file (trailing markers) is of no interest.
+    jpeg_abort_decompress(&cinfo);
+    ok = true;
+  }
+  delete job;
+  return ok;
+}
+
+}  // namespace BitmapFactory

@@ -1,0 +1,465 @@
+#include "common/CLyCairoCanvas.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+
+#include "codec/Bitmap.h"
+#include "common/CLyLog.h"
+
+#if __has_include(<cairo-evas-gl.h>)
+#include <Evas_GL.h>
+#include <cairo-evas-gl.h>
+#define LY_CAIRO_HAS_EVAS_GL 1
+#else
+#define LY_CAIRO_HAS_EVAS_GL 0
+#endif
+
+struct _CLyCairoCanvasGl {
+#if LY_CAIRO_HAS_EVAS_GL
+  cairo_device_t* device = nullptr;
+  Evas_GL* evasGl = nullptr;
+  Evas_GL_Config* config = nullptr;
+  Evas_GL_Surface* surface = nullptr;
+  Evas_GL_Context* context = nullptr;
+#endif
+};
+
+namespace {
+
+inline void setColor(cairo_t* cr, const CLyFloatRectangle& c) {
+  cairo_set_source_rgba(cr, c.x1, c.y1, c.x2, c.y2);
+}
+
+}  // namespace
+
+CLyCairoCanvas::CLyCairoCanvas(Evas_Object* image, const CLyRectangle& geometry, bool useGl) {
+  _init(image, geometry, useGl);
+}
+
+CLyCairoCanvas::CLyCairoCanvas(Evas_Object* image, int width, int height, bool useGl) {
+  _init(image, CLyRectangle(0, 0, width, height), useGl);
+}
+
+CLyCairoCanvas::~CLyCairoCanvas() {
+  _destroySurface();
+  if (mUseGl) _releaseGl();
+}
+
+void CLyCairoCanvas::_init(Evas_Object* image, const CLyRectangle& geometry, bool useGl) {
+  mImage = image;
+  mGeometry = geometry;
+  if (!mImage) LYLOG_E("Invalid image object: drawing into an off-screen buffer");
+  if (useGl) {
+    // The GL mode needs cairo's evas-GL device, which only some cairo builds
+    // carry (Debian's has none), and an evas with a GL engine. Without either
+    // the canvas falls back to software mode here, and draws the same pixels.
+    mUseGl = _initGl();
+    if (!mUseGl) LYLOG_W("No evas GL device: the canvas draws in software mode");
+  }
+  _createSurface();
+}
+
+bool CLyCairoCanvas::isValid() const {
+  return mSurface && mContext && cairo_status(mContext) == CAIRO_STATUS_SUCCESS &&
+         cairo_surface_status(mSurface) == CAIRO_STATUS_SUCCESS;
+}
+
+// ---------------------------------------------------------------- GL
+
+bool CLyCairoCanvas::_initGl() {
+#if LY_CAIRO_HAS_EVAS_GL
+  if (!mImage) return false;
+  mGl = new (std::nothrow) _CLyCairoCanvasGl();
+  if (!mGl) return false;
+  mGl->evasGl = evas_gl_new(evas_object_evas_get(mImage));
+  if (!mGl->evasGl) {
+    _releaseGl();
+    return false;
+  }
+  mGl->config = evas_gl_config_new();
+  mGl->config->color_format = EVAS_GL_RGBA_8888;
+  mGl->config->stencil_bits = EVAS_GL_STENCIL_BIT_1;
+  mGl->config->multisample_bits = EVAS_GL_MULTISAMPLE_MED;
+  mGl->context = evas_gl_context_create(mGl->evasGl, nullptr);
+  setenv("CAIRO_GL_COMPOSITOR", "msaa", 1);
+  mGl->device = cairo_evas_gl_device_create(mGl->evasGl, mGl->context);
+  if (!mGl->context || !mGl->device || cairo_device_status(mGl->device) != CAIRO_STATUS_SUCCESS) {
+    _releaseGl();
+    return false;
+  }
+  cairo_gl_device_set_thread_aware(mGl->device, 0);
+  return true;
+#else
+  return false;
+#endif
+}
+
+void CLyCairoCanvas::_releaseGl() {
+#if LY_CAIRO_HAS_EVAS_GL
+  if (!mGl) return;
+  if (mGl->device) cairo_device_destroy(mGl->device);
+  if (mGl->context) evas_gl_context_destroy(mGl->evasGl, mGl->context);
+  if (mGl->config) evas_gl_config_free(mGl->config);
+  if (mGl->evasGl) evas_gl_free(mGl->evasGl);
+#endif
+  delete mGl;
+  mGl = nullptr;
+}
+
+void CLyCairoCanvas::_flushGl() {
+  if (mUseGl && mSurface) cairo_surface_flush(mSurface);
+}
+
+// ---------------------------------------------------------------- surface
+
+void CLyCairoCanvas::_createSurface() {
+  int w = mGeometry.w, h = mGeometry.h;
+  if (w < 1 || h < 1) {
+    LYLOG_E("Invalid canvas size %d x %d", w, h);
+    w = std::max(w, 1);
+    h = std::max(h, 1);
+    mGeometry.w = w;
+    mGeometry.h = h;
+  }
+  if (!mImage) {
+    mSurface = cairo_image_surface_create(CAIRO_FORMAT_ARGB32, w, h);
+    mContext = cairo_create(mSurface);
+    return;
+  }
+  evas_object_image_size_set(mImage, w, h);
+  evas_object_resize(mImage, w, h);
+  evas_object_move(mImage, mGeometry.x, mGeometry.y);
+
+#if LY_CAIRO_HAS_EVAS_GL
+  if (mUseGl) {
+    mGl->surface = evas_gl_surface_create(mGl->evasGl, mGl->config, w, h);
+    Evas_Native_Surface ns;
+    evas_gl_native_surface_get(mGl->evasGl, mGl->surface, &ns);
+    evas_object_image_native_surface_set(mImage, &ns);
+    mSurface = cairo_gl_surface_create_for_evas_gl(mGl->device, mGl->surface, mGl->config, w, h);
+    mContext = cairo_create(mSurface);
+    clear();
+    return;
+  }
+#endif
+
+  // Software mode: cairo writes straight into the image object's own pixels.
+  auto* data = static_cast<unsigned char*>(evas_object_image_data_get(mImage, EINA_TRUE));
+  if (!data) {
+    LYLOG_E("Failed to get image data (%d x %d)", w, h);
+    mSurface = cairo_image_surface_create(CAIRO_FORMAT_ARGB32, w, h);
+    mContext = cairo_create(mSurface);
+    return;
+  }
+  int stride = evas_object_image_stride_get(mImage);
+  if (stride < cairo_format_stride_for_width(CAIRO_FORMAT_ARGB32, w))
+    stride = cairo_format_stride_for_width(CAIRO_FORMAT_ARGB32, w);
+  mSurface = cairo_image_surface_create_for_data(data, CAIRO_FORMAT_ARGB32, w, h, stride);
+  mContext = cairo_create(mSurface);
+  evas_object_image_data_set(mImage, data);
+}
+
+void CLyCairoCanvas::_destroySurface() {
+  if (mContext) cairo_destroy(mContext);
+  if (mSurface) cairo_surface_destroy(mSurface);
+  mContext = nullptr;
+  mSurface = nullptr;
+#if LY_CAIRO_HAS_EVAS_GL
+  if (mUseGl && mGl && mGl->surface) {
+    evas_object_image_native_surface_set(mImage, nullptr);
+    evas_gl_surface_destroy(mGl->evasGl, mGl->surface);
+    mGl->surface = nullptr;
+  }
+#endif
+}
+
+void CLyCairoCanvas::setGeometry(const CLyRectangle& geometry) {
+  mGeometry = geometry;
+  _destroySurface();
+  _createSurface();
+}
+
+void CLyCairoCanvas::resize(int w, int h) {
+  setGeometry(CLyRectangle(mGeometry.x, mGeometry.y, w, h));
+}
+
+// ---------------------------------------------------------------- whole canvas
+
+void CLyCairoCanvas::clear() {
+  if (!mContext) return;
+  cairo_save(mContext);
+  cairo_set_operator(mContext, CAIRO_OPERATOR_CLEAR);
+  cairo_paint(mContext);
+  cairo_restore(mContext);
+  _flushGl();
+}
+
+void CLyCairoCanvas::clearRect(const CLyFloatRectangle& rect) {
+  if (!mContext) return;
+  cairo_save(mContext);
+  cairo_set_operator(mContext, CAIRO_OPERATOR_CLEAR);
+  cairo_new_path(mContext);
+  setRectPath(rect);
+  cairo_clip(mContext);
+  cairo_paint(mContext);
+  _flushGl();
+  cairo_restore(mContext);
+}
+
+void CLyCairoCanvas::update() {
+  _flushGl();
+  if (mSurface && !mUseGl) cairo_surface_flush(mSurface);
+  if (mImage) evas_object_image_data_update_add(mImage, 0, 0, mGeometry.w, mGeometry.h);
+}
+
+void CLyCairoCanvas::update(const CLyFloatRectangle& rect) {
+  _flushGl();
+  if (mSurface && !mUseGl) cairo_surface_flush(mSurface);
+  if (mImage)
+    evas_object_image_data_update_add(mImage, (int)(rect.x1 - mGeometry.x), (int)(rect.y1 - mGeometry.y),
+                                      (int)rect.x2, (int)rect.y2);
+}
+
+// ---------------------------------------------------------------- paths
+
+void CLyCairoCanvas::beginPath() {
+  if (mContext) cairo_new_path(mContext);
+}
+
+void CLyCairoCanvas::setRectPath(const CLyFloatRectangle& rect) {
+  if (!mContext) return;
+  cairo_rectangle(mContext, rect.x1 - mGeometry.x, rect.y1 - mGeometry.y, rect.x2, rect.y2);
+}
+
+void CLyCairoCanvas::setRoundRectPath(const CLyFloatRectangle& rect, double rx, double ry) {
+  if (!mContext) return;
+  if (rx == 0 || ry == 0) {
+    setRectPath(rect);
+    return;
+  }
+  const double width = rect.x2, height = rect.y2;
+  // Radii never exceed half the rectangle, so opposite arcs cannot cross.
+  const double rxc = std::min(rx, width * 0.5), ryc = std::min(ry, height * 0.5);
+  if (rxc <= 0 || ryc <= 0) {
+    setRectPath(rect);
+    return;
+  }
+  const double r = std::max(rxc, ryc);
+  const double X = rect.x1 - mGeometry.x, Y = rect.y1 - mGeometry.y;
+  const double kx = r / rxc, ky = r / ryc;
+  cairo_save(mContext);
+  cairo_new_sub_path(mContext);
+  // Circle arcs of radius r in a system scaled by (rx/r, ry/r) are ellipse
+  // arcs with radii rx, ry on the canvas.
+  cairo_scale(mContext, rxc / r, ryc / r);
+  cairo_arc(mContext, (X + width - rxc) * kx, (Y + ryc) * ky, r, -M_PI / 2, 0);
+  cairo_arc(mContext, (X + width - rxc) * kx, (Y + height - ryc) * ky, r, 0, M_PI / 2);
+  cairo_arc(mContext, (X + rxc) * kx, (Y + height - ryc) * ky, r, M_PI / 2, M_PI);
+  cairo_arc(mContext, (X + rxc) * kx, (Y + ryc) * ky, r, M_PI, 3 * M_PI / 2);
+  cairo_close_path(mContext);
+  cairo_restore(mContext);
+}
+
+// ---------------------------------------------------------------- fill and stroke
+
+void CLyCairoCanvas::fillRect(const CLyFloatRectangle& color, const CLyFloatRectangle& rect) {
+  if (!mContext) return;
+  cairo_new_path(mContext);
+  setRectPath(rect);
+  setColor(mContext, color);
+  cairo_fill(mContext);
+}
+
+void CLyCairoCanvas::fillRoundRect(const CLyFloatRectangle& color, const CLyFloatRectangle& rect, double rx,
+                                   double ry) {
+  if (rx == 0 || ry == 0) {
+    fillRect(color, rect);
+    return;
+  }
+  if (!mContext) return;
+  cairo_new_path(mContext);
+  setRoundRectPath(rect, rx, ry);
+  setColor(mContext, color);
+  cairo_fill(mContext);
+}
+
+void CLyCairoCanvas::fillFrame(const CLyFloatRectangle& color, const CLyFloatRectangle& outer,
+                               const CLyFloatRectangle& inner) {
+  if (!mContext) return;
+  cairo_save(mContext);
+  cairo_new_path(mContext);
+  setRectPath(outer);
+  setRectPath(inner);
+  cairo_set_fill_rule(mContext, CAIRO_FILL_RULE_EVEN_ODD);
+  setColor(mContext, color);
+  cairo_fill(mContext);
+  cairo_restore(mContext);
+}
+
+void CLyCairoCanvas::fillRoundFrame(const CLyFloatRectangle& color, const CLyFloatRectangle& outer,
+                                    const CLyFloatRectangle& inner, double rx, double ry) {
+  if (rx == 0 || ry == 0) {
+    fillFrame(color, outer, inner);
+    return;
+  }
+  if (!mContext) return;
+  cairo_save(mContext);
+  cairo_new_path(mContext);
+  setRectPath(outer);
+  setRoundRectPath(inner, rx, ry);
+  cairo_set_fill_rule(mContext, CAIRO_FILL_RULE_EVEN_ODD);
+  setColor(mContext, color);
+  cairo_fill(mContext);
+  cairo_restore(mContext);
+}
+
+void CLyCairoCanvas::strokeRect(const CLyFloatRectangle& color, double lineWidth,
+                                const CLyFloatRectangle& rect) {
+  if (!mContext) return;
+  const double x = rect.x1 - mGeometry.x, y = rect.y1 - mGeometry.y;
+  cairo_new_path(mContext);
+  cairo_move_to(mContext, x, y);
+  cairo_line_to(mContext, x + rect.x2, y);
+  cairo_line_to(mContext, x + rect.x2, y + rect.y2);
+  cairo_line_to(mContext, x, y + rect.y2);
+  cairo_close_path(mContext);
+  cairo_set_line_width(mContext, lineWidth);
+  setColor(mContext, color);
+  cairo_stroke(mContext);
+}
+
+void CLyCairoCanvas::strokeRoundRect(const CLyFloatRectangle& color, double lineWidth,
+                                     const CLyFloatRectangle& rect, double rx, double ry) {
+  if (rx == 0 || ry == 0) {
+    strokeRect(color, lineWidth, rect);
+    return;
+  }
+  if (!mContext) return;
+  cairo_new_path(mContext);
+  setRoundRectPath(rect, rx, ry);
+  cairo_set_line_width(mContext, lineWidth);
+  setColor(mContext, color);
+  cairo_stroke(mContext);
+}
+
+void CLyCairoCanvas::drawIcon(const char* pngPath, const CLyFloatRectangle& rect) {
+  if (!mContext) return;
+  if (!pngPath) {
+    LYLOG_E("Invalid icon path");
+    return;
+  }
+  cairo_surface_t* icon = cairo_image_surface_create_from_png(pngPath);
+  if (cairo_surface_status(icon) != CAIRO_STATUS_SUCCESS) {
+    LYLOG_E("Failed to load icon %s", pngPath);
+    cairo_surface_destroy(icon);
+    return;
+  }
+  const int iw = cairo_image_surface_get_width(icon), ih = cairo_image_surface_get_height(icon);
+  cairo_save(mContext);
+  cairo_new_path(mContext);
+  setRectPath(rect);
+  cairo_clip(mContext);
+  cairo_translate(mContext, (int)std::floor(rect.x1 - mGeometry.x + (rect.x2 - iw) * 0.5 + 0.01),
+                  (int)std::floor(rect.y1 - mGeometry.y + (rect.y2 - ih) * 0.5 + 0.01));
+  cairo_set_source_surface(mContext, icon, 0, 0);
+  cairo_paint(mContext);
+  cairo_restore(mContext);
+  cairo_surface_destroy(icon);
+}
+
+// ---------------------------------------------------------------- bitmaps
+
+cairo_surface_t* CLyCairoCanvas::createSurface(Bitmap* bitmap) {
+  if (!bitmap) {
+    LYLOG_D("Invalid bitmap");
+    return cairo_image_surface_create(CAIRO_FORMAT_ARGB32, 32, 32);
+  }
+  if (!bitmap->getPixels() || bitmap->getWidth() < 1 || bitmap->getHeight() < 1) {
+    LYLOG_E("Invalid bitmap");
+    return nullptr;
+  }
+  if (Bitmap::bytesPerPixel(bitmap->getFormat()) != 4 || bitmap->getFormat() != BITMAP_FORMAT_BGRA) {
+    LYLOG_E("Unsupported bitmap format %d", bitmap->getFormat());
+    return nullptr;
+  }
+  const int w = bitmap->getWidth(), h = bitmap->getHeight();
+  cairo_surface_t* image = cairo_image_surface_create_for_data(
+      bitmap->getPixels(), CAIRO_FORMAT_ARGB32, w, h, cairo_format_stride_for_width(CAIRO_FORMAT_ARGB32, w));
+  if (cairo_surface_status(image) != CAIRO_STATUS_SUCCESS) {
+    LYLOG_E("Failed to create surface");
+    cairo_surface_destroy(image);
+    return nullptr;
+  }
+#if LY_CAIRO_HAS_EVAS_GL
+  if (mUseGl) {
+    cairo_surface_t* gl = cairo_gl_surface_create(mGl->device, CAIRO_CONTENT_COLOR_ALPHA, w, h);
+    cairo_t* cr = cairo_create(gl);
+    cairo_set_source_surface(cr, image, 0, 0);
+    cairo_rectangle(cr, 0, 0, w, h);
+    cairo_fill(cr);
+    cairo_destroy(cr);
+    cairo_surface_destroy(image);
+    return gl;
+  }
+#endif
+  return image;
+}
+
+void CLyCairoCanvas::_setSourcePattern(cairo_surface_t* surface, const cairo_matrix_t& matrix) {
+  cairo_pattern_t* pattern = cairo_pattern_create_for_surface(surface);
+  cairo_pattern_set_matrix(pattern, &matrix);
+  // PAD, not NONE: a crop touching the bitmap's edge would otherwise blend
+  // transparent texels into the cell's outer pixel row.
+  cairo_pattern_set_extend(pattern, CAIRO_EXTEND_PAD);
+  cairo_pattern_set_filter(pattern, mFilter);
+  cairo_set_source(mContext, pattern);
+  cairo_fill(mContext);
+  cairo_pattern_destroy(pattern);
+}
+
+void CLyCairoCanvas::drawBitmap(cairo_surface_t* surface, const CLyFloatRectangle& dst,
+                                const CLyRectangle& src) {
+  if (!mContext) return;
+  if (!surface || cairo_surface_status(surface) != CAIRO_STATUS_SUCCESS) {
+    LYLOG_E("Invalid surface");
+    cairo_new_path(mContext);
+    return;
+  }
+  if (dst.x2 <= 0 || dst.y2 <= 0 || src.w <= 0 || src.h <= 0) {
+    LYLOG_E("Invalid rectangle dst %f x %f, src %d x %d", dst.x2, dst.y2, src.w, src.h);
+    cairo_new_path(mContext);
+    return;
+  }
+  cairo_matrix_t m;
+  cairo_matrix_init_translate(&m, src.x, src.y);
+  cairo_matrix_scale(&m, src.w / (double)dst.x2, src.h / (double)dst.y2);
+  cairo_matrix_translate(&m, -(dst.x1 - mGeometry.x), -(dst.y1 - mGeometry.y));
+  _setSourcePattern(surface, m);
+}
+
+void CLyCairoCanvas::drawBitmap(Bitmap* bitmap, const CLyFloatRectangle& dst) {
+  if (!mContext) return;
+  if (!bitmap) {
+    LYLOG_E("Invalid bitmap");
+    cairo_new_path(mContext);
+    return;
+  }
+  cairo_surface_t* surface = createSurface(bitmap);
+  if (!surface) {
+    LYLOG_E("Failed to create surface");
+    cairo_new_path(mContext);
+    return;
+  }
+  if (dst.x2 <= 0 || dst.y2 <= 0) {
+    LYLOG_E("Invalid rectangle dst %f x %f", dst.x2, dst.y2);
+    cairo_new_path(mContext);
+    cairo_surface_destroy(surface);
+    return;
+  }
+  cairo_matrix_t m;
+  cairo_matrix_init_scale(&m, bitmap->getWidth() / (double)dst.x2, bitmap->getHeight() / (double)dst.y2);
+  cairo_matrix_translate(&m, -(dst.x1 - mGeometry.x), -(dst.y1 - mGeometry.y));
+  _setSourcePattern(surface, m);
+  cairo_surface_destroy(surface);
+}

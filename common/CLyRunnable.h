@@ -1,0 +1,8 @@
+#pragma once
+// Something a CLyThread can run.
+
+class CLyRunnable {
+ public:
+  virtual ~CLyRunnable() = default;
+  virtual void run() = 0;
+};

@@ -1,0 +1,834 @@
+#include "control/CLyMultiGrid.h"
+
+#include <Elementary.h>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <new>
+
+#include "codec/Bitmap.h"
+#include "codec/BitmapFactory.h"
+#include "common/CLyAppData.h"
+#include "common/CLyCairoCanvas.h"
+#include "common/CLyLog.h"
+#include "common/CLyUtil.h"
+#include "control/CLyMultiGridImpl.h"
+#include "common/CLyEvent.h"
+#include "model/CLyMultiGridDrawRectList.h"
+#include "model/CLyMultiGridModel.h"
+#include "model/CLyMultiGridSrcItem.h"
+#include "model/CLyMultiGridSrcItemList.h"
+
+namespace {
+
+// Aspect ratios, width : height, indexed by CLyMultiGridRatio.
+const int kRatios[LY_RATIO_COUNT][2] = {{1, 1}, {2, 3}, {3, 4}, {9, 16}, {16, 9}, {4, 3}, {3, 2}};
+
+const char* const kLayoutFile = "edje/LyLayoutHover.edj";
+const char* const kLayoutGroup = "LyLayoutHover";
+const char* const kAddPictureIcon = "images/collage_add_picture.png";
+const int kWindowRotatedEvent = 4;
+
+void ratioOf(int ratio, int& w, int& h) {
+  if (ratio < 0 || ratio >= LY_RATIO_COUNT) {
+    LYLOG_E("Invalid ratio %d, using 1:1", ratio);
+    ratio = 0;
+  }
+  w = kRatios[ratio][0];
+  h = kRatios[ratio][1];
+}
+
+bool sameRect(const CLyFloatRectangle& a, const CLyFloatRectangle& b) {
+  return a.x1 == b.x1 && a.y1 == b.y1 && a.x2 == b.x2 && a.y2 == b.y2;
+}
+
+// A JPEG is complete when it starts with SOI and its last marker is EOI;
+// a write cut short (full disk, I/O error) fails this test.
+bool isCompleteJpeg(const char* path) {
+  int fd = open(path, O_RDONLY | O_CLOEXEC);
+  if (fd < 0) return false;
+  unsigned char head[2] = {0, 0}, tail[2] = {0, 0};
+  struct stat st {};
+  bool ok = fstat(fd, &st) == 0 && st.st_size > 4 && pread(fd, head, 2, 0) == 2 &&
+            pread(fd, tail, 2, st.st_size - 2) == 2 && head[0] == 0xFF && head[1] == 0xD8 &&
+            tail[0] == 0xFF && tail[1] == 0xD9;
+  // The data must be on the disk before the file takes its final name.
+  ok = ok && fsync(fd) == 0;
+  close(fd);
+  return ok;
+}
+
+std::string temporaryPathFor(const std::string& path) {
+  static std::atomic<unsigned> counter{0};
+  std::string dir = ".", name = path;
+  size_t slash = path.rfind('/');
+  if (slash != std::string::npos) {
+    dir = path.substr(0, slash);
+    name = path.substr(slash + 1);
+  }
+  char suffix[64];
+  // Ends in ".jpg" so the image saver picks the JPEG encoder.
+  snprintf(suffix, sizeof suffix, ".part-%d-%u.jpg", (int)getpid(), counter++);
+  return dir + "/." + name + suffix;
+}
+
+}  // namespace
+
+// ---------------------------------------------------------------- construction
+
+CLyMultiGrid::CLyMultiGrid(CLyMultiGridDrawRectList* drawRectList, CLyMultiGridSrcItemList* srcItemList,
+                           int width, int height) {
+  _pImpl = new (std::nothrow) _CLyMultiGridImpl();
+  if (!_pImpl) {
+    LYLOG_E("Failed to create implement");
+    return;
+  }
+  _pImpl->drawRectList = drawRectList;
+  _pImpl->srcItemList = srcItemList;
+  _pImpl->viewWidth = width;
+  _pImpl->viewHeight = height;
+}
+
+CLyMultiGrid::~CLyMultiGrid() {
+  if (!_pImpl) return;
+  __destroySurfaces();
+  delete _pImpl->canvas;
+  delete _pImpl->bgDrawRoi;
+  delete _pImpl;
+  _pImpl = nullptr;
+}
+
+bool CLyMultiGrid::prepare(Evas_Object* win, Evas_Object* parent) {
+  if (!_pImpl) return false;
+  if (!win) {
+    LYLOG_E("Invalid win");
+    return false;
+  }
+  if (!parent) {
+    LYLOG_E("Invalid parent");
+    return false;
+  }
+  char* path = CLyUtil::getEdjPath(kLayoutFile);
+  Evas_Object* layout = elm_layout_add(parent);
+  if (!path || !layout || !elm_layout_file_set(layout, path, kLayoutGroup)) {
+    LYLOG_E("Invalid EDJ");
+    free(path);
+    if (layout) evas_object_del(layout);
+    return false;
+  }
+  free(path);
+  evas_object_size_hint_weight_set(layout, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
+  evas_object_size_hint_align_set(layout, EVAS_HINT_FILL, EVAS_HINT_FILL);
+  Evas_Object* box = elm_box_add(layout);
+  elm_object_part_content_set(layout, "elm.swallow.content", box);
+  _pImpl->layout = layout;
+  _pImpl->box = box;
+  _pImpl->controlObj = layout;
+  return true;
+}
+
+Evas_Object* CLyMultiGrid::onCreateView(Evas_Object* /*parent*/, void* /*param*/) {
+  if (!_pImpl || !_pImpl->layout) {
+    LYLOG_E("Not initialized!");
+    return nullptr;
+  }
+  if (_pImpl->saveMode) {
+    evas_object_hide(_pImpl->layout);
+    evas_object_hide(_pImpl->controlObj);
+  } else {
+    evas_object_show(_pImpl->layout);
+  }
+  return _pImpl->layout;
+}
+
+void CLyMultiGrid::onCreated() {
+  if (!_pImpl) return;
+  setViewSize(_pImpl->ratio, _pImpl->viewWidth, _pImpl->viewHeight);
+  if (!_pImpl->saveMode) __setDefaultBorderMargin();
+  __createBgObject();
+  __createCanvas();
+  if (!_pImpl->saveMode) __setupTouch();
+}
+
+void CLyMultiGrid::onDestroy() {
+  if (!_pImpl) return;
+  __teardownTouch();
+  __destroySurfaces();
+  delete _pImpl->canvas;
+  _pImpl->canvas = nullptr;
+  if (_pImpl->canvasImage) evas_object_del(_pImpl->canvasImage);
+  if (_pImpl->bgObj) evas_object_del(_pImpl->bgObj);
+  _pImpl->canvasImage = nullptr;
+  _pImpl->bgObj = nullptr;
+  _pImpl->layout = nullptr;
+  _pImpl->box = nullptr;
+  _pImpl->controlObj = nullptr;
+}
+
+void CLyMultiGrid::onEvent(const CLyEvent& event) {
+  LYLOG_D("CLyMultiGrid event %d", event.type);
+  if (!_pImpl || event.type != kWindowRotatedEvent) return;
+  __abortPressEffect();
+  int w = 0, h = 0;
+  CLyAppData::getInstance()->getScreenSize(&w, &h);
+  LYLOG_D("win size: %d %d", w, h);
+  setViewSize(_pImpl->ratio, w, h);
+  __relayout();
+  __updateFocusRect();
+}
+
+// ---------------------------------------------------------------- setters
+
+void CLyMultiGrid::setSaveMode(bool saveMode) {
+  if (_pImpl) _pImpl->saveMode = saveMode;
+}
+
+void CLyMultiGrid::setUseGl(bool useGl) {
+  if (_pImpl) _pImpl->useGl = useGl;
+}
+
+void CLyMultiGrid::setSingleImageMode(bool singleImageMode) {
+  if (_pImpl) _pImpl->singleImageMode = singleImageMode;
+}
+
+void CLyMultiGrid::setBackgroundColor(const CLyRectangle& color) {
+  if (!_pImpl || color == _pImpl->bgColor) return;
+  _pImpl->bgColor = color;
+  if (_pImpl->bgObj) {
+    const CLyRectangle& c = _pImpl->bgColor;
+    // evas colours are premultiplied by alpha
+    evas_object_color_set(_pImpl->bgObj, c.x * c.h / 255, c.y * c.h / 255, c.w * c.h / 255, c.h);
+  }
+  notifyChanged(true);
+}
+
+void CLyMultiGrid::setBorderMarginValue(double value) {
+  if (!_pImpl || value == _pImpl->marginValue) return;
+  LYLOG_D("marginValue %f", value);
+  _pImpl->marginValue = value;
+  if (_pImpl->drawRectList) _pImpl->drawRectList->setSpacingStep((int)value);
+  __draw();
+  notifyChanged(true);
+}
+
+void CLyMultiGrid::setBorderRoundnessValue(double value) {
+  if (!_pImpl || value == _pImpl->roundnessValue) return;
+  LYLOG_D("roundnessValue %f", value);
+  _pImpl->roundnessValue = value;
+  if (_pImpl->drawRectList) _pImpl->drawRectList->setRoundStep((int)value);
+  __updateGridImages();
+  notifyChanged(true);
+}
+
+void CLyMultiGrid::setViewRatio(int ratio, bool apply) {
+  if (!_pImpl) return;
+  LYLOG_D("ratio %d", ratio);
+  if (ratio < 0 || ratio >= LY_RATIO_COUNT) {
+    LYLOG_E("Invalid ratio %d", ratio);
+    return;
+  }
+  _pImpl->ratio = ratio;
+  if (!apply) return;
+  setViewSize(ratio, _pImpl->viewWidth, _pImpl->viewHeight);
+  __relayout();
+  notifyChanged(true);
+}
+
+void CLyMultiGrid::setViewSize(int ratio, int width, int height) {
+  if (!_pImpl) return;
+  LYLOG_D("ratio: %d, width: %d, height: %d", ratio, width, height);
+  if (ratio < 0 || ratio >= LY_RATIO_COUNT) {
+    LYLOG_E("Invalid ratio %d", ratio);
+    ratio = 0;
+  }
+  _pImpl->ratio = ratio;
+  _pImpl->viewWidth = width;
+  _pImpl->viewHeight = height;
+  int left = 0, right = 0, top = 0, bottom = 0;
+  if (!_pImpl->saveMode) __getProportionPadding(ratio, left, right, top, bottom);
+  __calculateViewSize(ratio, width, height, left, right, top, bottom);
+  __updateBgDrawRoi();
+}
+
+void CLyMultiGrid::setLayoutIndex(int index) {
+  LYLOG_D("setLayoutIndex %d", index);
+  __draw();
+  notifyChanged(true);
+}
+
+// ---------------------------------------------------------------- queries
+
+int CLyMultiGrid::getCurrentIndex() const {
+  return _pImpl ? _pImpl->currentIndex : -1;
+}
+int CLyMultiGrid::getRatio() const {
+  return _pImpl ? _pImpl->ratio : 0;
+}
+
+const CLyRectangle& CLyMultiGrid::getBackgroundColor() const {
+  static const CLyRectangle white(255, 255, 255, 255);
+  return _pImpl ? _pImpl->bgColor : white;
+}
+
+double CLyMultiGrid::getRoundnessValue() const {
+  return _pImpl ? _pImpl->roundnessValue : 0.0;
+}
+double CLyMultiGrid::getMarginValue() const {
+  return _pImpl ? _pImpl->marginValue : 0.0;
+}
+const CLyRectangle* CLyMultiGrid::getCollageRect() const {
+  return _pImpl ? _pImpl->bgDrawRoi : nullptr;
+}
+bool CLyMultiGrid::isChanged() const {
+  return _pImpl && _pImpl->changed;
+}
+
+bool CLyMultiGrid::computeSaveSize(CLyMultiGridSrcItemList* srcItemList, int ratio, int limit, int& width,
+                                   int& height) {
+  int index = srcItemList ? srcItemList->indexOfLargest() : -1;
+  if (index < 0) {
+    LYLOG_E("Invalid index[%d]", index);
+    return false;
+  }
+  CLyMultiGridSrcItem* item = srcItemList->get(index);
+  if (!item || !item->getBitmap()) {
+    LYLOG_E("Invalid srcItem");
+    return false;
+  }
+  int rw = 1, rh = 1;
+  ratioOf(ratio, rw, rh);
+  const Bitmap* bitmap = item->getBitmap();
+  width = std::min(limit, std::max(bitmap->getWidth(), bitmap->getHeight()));
+  height = (int)((float)width * rh / rw);
+  return width > 0 && height > 0;
+}
+
+bool CLyMultiGrid::getSaveSize(int limit, int& width, int& height) const {
+  if (!_pImpl) return false;
+  return computeSaveSize(_pImpl->srcItemList, _pImpl->ratio, limit, width, height);
+}
+
+Bitmap* CLyMultiGrid::clone(int index) const {
+  if (!_pImpl || !_pImpl->srcItemList) return nullptr;
+  if (index == -1 || index == -2) index = _pImpl->currentIndex;
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList->get(index);
+  if (!item) return nullptr;
+  Bitmap* bitmap = item->getBitmap();
+  if (!bitmap || !bitmap->getPixels()) {
+    LYLOG_E("Invalid buffer");
+    return nullptr;
+  }
+  return BitmapFactory::clone(*bitmap);
+}
+
+void CLyMultiGrid::notifyChanged(bool value) {
+  if (!_pImpl || _pImpl->saveMode) return;
+  _pImpl->changed = value;
+  if (_pImpl->changeCb) _pImpl->changeCb(value, __isValidItemIndex(_pImpl->currentIndex));
+}
+
+bool CLyMultiGrid::__isValidItemIndex(int index) const {
+  return _pImpl && _pImpl->srcItemList && index >= 0 && _pImpl->srcItemList->get(index) != nullptr;
+}
+
+// ---------------------------------------------------------------- view size
+
+bool CLyMultiGrid::__getProportionPadding(int ratio, int& left, int& right, int& top, int& bottom) {
+  left = right = top = bottom = 0;
+  int entry;
+  switch (ratio) {
+    case LY_RATIO_1_1:
+      entry = 0;
+      break;
+    case LY_RATIO_3_4:
+      entry = 1;
+      break;
+    case LY_RATIO_9_16:
+      entry = 2;
+      break;
+    default:
+      LYLOG_E("Invalid count");
+      return false;
+  }
+  if (_pImpl->margins.empty()) {
+    // A missing or broken margins file costs the paddings, not the program.
+    try {
+      CLyMultiGridModel model;
+      for (int i = 0; i < model.getMarginsCount(); i++) _pImpl->margins.push_back(model.getMargins(i));
+    } catch (const std::exception& e) {
+      LYLOG_E("Failed to load margins: %s", e.what());
+    }
+  }
+  if ((size_t)entry >= _pImpl->margins.size() || _pImpl->margins[entry].size() < 4) {
+    LYLOG_E("Invalid count");
+    return false;
+  }
+  const std::vector<int>& m = _pImpl->margins[entry];
+  int rotation = CLyAppData::getInstance()->getWindowRotation();
+  if (rotation == 0 || rotation == 180) {
+    top = m[0];
+    bottom = m[1];
+    LYLOG_D("padding: %d  %d", top, bottom);
+  } else {
+    left = m[2];
+    right = m[3];
+    LYLOG_D("padding: %d  %d", left, right);
+  }
+  return true;
+}
+
+void CLyMultiGrid::__calculateViewSize(int ratio, int width, int height, int left, int right, int top,
+                                       int bottom) {
+  if (width == 0) width = 1;
+  if (height == 0) height = 1;
+  int rw = 1, rh = 1;
+  ratioOf(ratio, rw, rh);
+  float availW = (float)(width - left - right), availH = (float)(height - top - bottom);
+  if (availW < 1) availW = 1;
+  if (availH < 1) availH = 1;
+  float w = availW, h = availW * rh / rw;
+  if (h > availH) {
+    w = w * availH / h;
+    h = availH;
+  }
+  float x = left + (availW - w) * 0.5f, y = top + (availH - h) * 0.5f;
+  LYLOG_D("size: %f %f, pad: %f %f", w, h, x, y);
+  if (!_pImpl->drawRectList) return;
+  _pImpl->drawRectList->setSize((int)w, (int)h);
+  _pImpl->drawRectList->setOffsetY((int)y);
+  _pImpl->drawRectList->setOffsetX((int)x);
+}
+
+void CLyMultiGrid::__updateBgDrawRoi() {
+  if (!_pImpl->drawRectList) return;
+  if (!_pImpl->bgDrawRoi) {
+    _pImpl->bgDrawRoi = new (std::nothrow) CLyRectangle();
+    if (!_pImpl->bgDrawRoi) {
+      LYLOG_E("Failed to create bgDrawRoi");
+      return;
+    }
+  }
+  CLyMultiGridDrawRectList* list = _pImpl->drawRectList;
+  _pImpl->bgDrawRoi->set(list->getOffsetX(), list->getOffsetY(), list->getWidth(), list->getHeight());
+}
+
+void CLyMultiGrid::__relayout() {
+  const CLyRectangle* roi = _pImpl->bgDrawRoi;
+  if (!roi) return;
+  if (_pImpl->bgObj) {
+    evas_object_move(_pImpl->bgObj, roi->x, roi->y);
+    evas_object_resize(_pImpl->bgObj, roi->w, roi->h);
+  }
+  if (_pImpl->canvas) _pImpl->canvas->setGeometry(*roi);
+  __resizeFocusBox();
+  __draw();
+}
+
+// ---------------------------------------------------------------- objects
+
+void CLyMultiGrid::__createBgObject() {
+  if (!_pImpl->controlObj) return;
+  if (!_pImpl->bgDrawRoi) {
+    LYLOG_E("Bg size info is wrong");
+    return;
+  }
+  Evas_Object* bg = evas_object_rectangle_add(evas_object_evas_get(_pImpl->controlObj));
+  if (!bg) return;
+  evas_object_size_hint_weight_set(bg, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
+  evas_object_size_hint_align_set(bg, EVAS_HINT_FILL, EVAS_HINT_FILL);
+  evas_object_resize(bg, _pImpl->bgDrawRoi->w, _pImpl->bgDrawRoi->h);
+  evas_object_move(bg, _pImpl->bgDrawRoi->x, _pImpl->bgDrawRoi->y);
+  evas_object_smart_member_add(bg, _pImpl->controlObj);
+  evas_object_color_set(bg, 0, 0, 0, 255);
+  evas_object_show(bg);
+  _pImpl->bgObj = bg;
+}
+
+bool CLyMultiGrid::__createCanvas() {
+  if (!_pImpl->controlObj || !_pImpl->bgDrawRoi) return false;
+  Evas_Object* image = evas_object_image_filled_add(evas_object_evas_get(_pImpl->controlObj));
+  if (!image) {
+    LYLOG_E("Failed to add canvas");
+    return false;
+  }
+  evas_object_image_colorspace_set(image, EVAS_COLORSPACE_ARGB8888);
+  evas_object_image_alpha_set(image, EINA_TRUE);
+  evas_object_pass_events_set(image, EINA_TRUE);
+  CLyCairoCanvas* canvas = new (std::nothrow) CLyCairoCanvas(image, *_pImpl->bgDrawRoi, _pImpl->useGl);
+  if (!canvas || !canvas->isValid()) {
+    LYLOG_E("Failed to add canvas");
+    delete canvas;
+    evas_object_del(image);
+    return false;
+  }
+  // The screen canvas is redrawn on every pan step and keeps the cheap
+  // bilinear filter; the saved picture is drawn once and must not alias when
+  // a large crop shrinks into a small cell.
+  canvas->setFilter(_pImpl->saveMode ? CAIRO_FILTER_GOOD : CAIRO_FILTER_BILINEAR);
+  evas_object_smart_member_add(image, _pImpl->controlObj);
+  evas_object_show(image);
+  _pImpl->canvasImage = image;
+  _pImpl->canvas = canvas;
+  return true;
+}
+
+void CLyMultiGrid::__setDefaultBorderMargin() {
+  if (_pImpl->drawRectList) _pImpl->drawRectList->setSpacingStep(1);
+  _pImpl->marginValue = 1.0;
+  LYLOG_D("marginValue: %f", _pImpl->marginValue);
+}
+
+// ---------------------------------------------------------------- surfaces
+
+void CLyMultiGrid::__destroySurfaces() {
+  if (!_pImpl) return;
+  for (cairo_surface_t* s : _pImpl->surfaces)
+    if (s) cairo_surface_destroy(s);
+  _pImpl->surfaces.clear();
+  _pImpl->drawnRects.clear();
+}
+
+cairo_surface_t* CLyMultiGrid::__createSurface(int index) {
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList ? _pImpl->srcItemList->get(index) : nullptr;
+  if (!item || !item->getBitmap() || !_pImpl->canvas) return nullptr;
+  return _pImpl->canvas->createSurface(item->getBitmap());
+}
+
+void CLyMultiGrid::__createSurfaces() {
+  if (!_pImpl->srcItemList) return;
+  int count = _pImpl->srcItemList->count();
+  for (int i = 0; i < count; i++) {
+    cairo_surface_t* s = __createSurface(i);
+    if (!s) {
+      CLyMultiGridSrcItem* item = _pImpl->srcItemList->get(i);
+      if (!(item && item->isFake())) LYLOG_E("Invalid surface");
+    }
+    // A slot per item, also an empty one, so that surface i always shows item i.
+    _pImpl->surfaces.push_back(s);
+  }
+  _pImpl->drawnRects.assign(count, CLyFloatRectangle());
+}
+
+void CLyMultiGrid::refresh() {
+  if (!_pImpl) return;
+  if (!_pImpl->bgColorApplied && _pImpl->bgObj) {
+    const CLyRectangle& c = _pImpl->bgColor;
+    evas_object_color_set(_pImpl->bgObj, c.x * c.h / 255, c.y * c.h / 255, c.w * c.h / 255, c.h);
+    _pImpl->bgColorApplied = true;
+  }
+  __destroySurfaces();
+  __createSurfaces();
+  __draw();
+}
+
+// ---------------------------------------------------------------- drawing
+
+bool CLyMultiGrid::__calculateRectSize(const CLyRectangle& crop, const CLyFloatRectangle& cell,
+                                       CLyRectangle& result) const {
+  const int cw = crop.w - crop.x, ch = crop.h - crop.y;
+  LYLOG_D("drawRect %f %f %f %f", cell.x1, cell.y1, cell.x2, cell.y2);
+  LYLOG_D("srcRect %d %d %d %d", crop.x, crop.y, crop.w, crop.h);
+  if (cw <= 0 || ch <= 0 || cell.x2 <= 0 || cell.y2 <= 0) return false;
+  int nw, nh;
+  if (cw < ch) {
+    nh = ch;
+    nw = (int)((float)ch * cell.x2 / cell.y2);
+  } else {
+    nw = cw;
+    nh = (int)((float)cw * cell.y2 / cell.x2);
+  }
+  if (nw < 1 || nh < 1) return false;
+  result.set(crop.x, crop.y, crop.x + nw, crop.y + nh);
+  LYLOG_D("returnRect %d %d %d %d", result.x, result.y, result.w, result.h);
+  return true;
+}
+
+void CLyMultiGrid::__createGridImage(int index, const CLyFloatRectangle& cell) {
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList ? _pImpl->srcItemList->get(index) : nullptr;
+  if (!item) {
+    LYLOG_E("Invalid src item");
+    return;
+  }
+  CLyCairoCanvas* canvas = _pImpl->canvas;
+  if (!canvas) return;
+  const double r = _pImpl->drawRectList ? _pImpl->drawRectList->getRoundness() : 0;
+  if (_pImpl->singleImageMode && item->isFake()) {
+    LYLOG_D("Fake image");
+    canvas->fillRoundRect(CLyFloatRectangle(0, 0, 0, 1.0f), cell, r, r);
+    char* icon = CLyUtil::getImagePath(kAddPictureIcon);
+    if (!icon) {
+      LYLOG_E("Invalid res path");
+      return;
+    }
+    canvas->drawIcon(icon, cell);
+    free(icon);
+    return;
+  }
+  cairo_surface_t* surface = (size_t)index < _pImpl->surfaces.size() ? _pImpl->surfaces[index] : nullptr;
+  const CLyRectangle* crop = item->getSrcRect();
+  if (!crop) {
+    LYLOG_E("Invalid src rect");
+    return;
+  }
+  canvas->beginPath();
+  canvas->setRoundRectPath(cell, r, r);
+  canvas->drawBitmap(surface, cell, CLyRectangle(crop->x, crop->y, crop->w - crop->x, crop->h - crop->y));
+}
+
+// Draws the cells in order. newCrops: give every item the crop fitted to its
+// cell; skipUnchanged: leave cells whose crop and rectangle are unchanged
+// (clearing the old and new place of those that changed). False when drawing
+// stopped at a missing item or bitmap.
+bool CLyMultiGrid::__drawCells(bool clearFirst, bool newCrops, bool skipUnchanged) {
+  CLyMultiGridSrcItemList* items = _pImpl->srcItemList;
+  CLyMultiGridDrawRectList* rects = _pImpl->drawRectList;
+  CLyCairoCanvas* canvas = _pImpl->canvas;
+  if (clearFirst) canvas->clear();
+  const int count = items->count();
+  if ((int)_pImpl->drawnRects.size() < count) _pImpl->drawnRects.resize(count);
+  for (int i = 0; i < count; i++) {
+    LYLOG_D("count: %d", i);
+    CLyMultiGridSrcItem* item = items->get(i);
+    if (!item) {
+      LYLOG_E("Invalid src item");
+      return false;
+    }
+    const CLyFloatRectangle d = rects->get(i);
+    if (!item->getBitmap()) {
+      if (_pImpl->singleImageMode && item->isFake()) {
+        if (skipUnchanged && sameRect(d, _pImpl->drawnRects[i])) continue;
+        if (skipUnchanged) {
+          canvas->clearRect(_pImpl->drawnRects[i]);
+          canvas->clearRect(d);
+        }
+        __createGridImage(i, d);
+        _pImpl->drawnRects[i] = d;
+        continue;
+      }
+      LYLOG_E("Invalid src item image data");
+      return false;
+    }
+    if (newCrops) {
+      const CLyRectangle* old = item->getSrcRect();
+      CLyRectangle crop;
+      if (!old || !__calculateRectSize(*old, d, crop)) {
+        LYLOG_E("Failed to get new Rect");
+        continue;
+      }
+      if (skipUnchanged && crop == *old && sameRect(d, _pImpl->drawnRects[i])) {
+        LYLOG_D("Same Rect");
+        continue;
+      }
+      CLyRectangle* owned = new (std::nothrow) CLyRectangle(crop);
+      if (!owned) {
+        LYLOG_E("Failed to get new Rect");
+        continue;
+      }
+      item->setSrcRect(owned);
+    }
+    if (skipUnchanged) {
+      // The cell may have moved: wipe where it was as well as where it goes.
+      canvas->clearRect(_pImpl->drawnRects[i]);
+      canvas->clearRect(d);
+    }
+    __createGridImage(i, d);
+    _pImpl->drawnRects[i] = d;
+  }
+  return true;
+}
+
+void CLyMultiGrid::__draw() {
+  if (!_pImpl || !_pImpl->drawRectList || !_pImpl->srcItemList || !_pImpl->canvas) return;
+  if (_pImpl->surfaces.empty()) {
+    LYLOG_D("Surfaces are not created yet");
+    return;
+  }
+  __drawCells(true, true, false);
+  _pImpl->canvas->update();
+}
+
+void CLyMultiGrid::__drawGridImages() {
+  if (!_pImpl || !_pImpl->drawRectList || !_pImpl->srcItemList || !_pImpl->canvas) return;
+  if (_pImpl->surfaces.empty()) {
+    LYLOG_D("Surfaces are not created yet");
+    return;
+  }
+  __drawCells(false, true, true);
+  _pImpl->canvas->update();
+}
+
+void CLyMultiGrid::__updateGridImages() {
+  if (!_pImpl || !_pImpl->drawRectList || !_pImpl->srcItemList || !_pImpl->canvas) return;
+  if (_pImpl->surfaces.empty()) {
+    LYLOG_D("Surfaces are not created yet");
+    return;
+  }
+  __drawCells(true, false, false);
+  _pImpl->canvas->update();
+}
+
+void CLyMultiGrid::__updateImage(int index, const CLyFloatRectangle& cell, bool recreate) {
+  if (!_pImpl || !_pImpl->canvas) return;
+  LYLOG_D("Clean previous image");
+  _pImpl->canvas->clearRect(cell);
+  if (_pImpl->surfaces.empty()) {
+    LYLOG_D("Surfaces are not created yet");
+    return;
+  }
+  if (index < 0 || (size_t)index >= _pImpl->surfaces.size()) {
+    LYLOG_E("Invalid index [%d]", index);
+    return;
+  }
+  if (recreate) {
+    if (_pImpl->surfaces[index]) cairo_surface_destroy(_pImpl->surfaces[index]);
+    _pImpl->surfaces[index] = __createSurface(index);
+  }
+  __createGridImage(index, cell);
+  if ((size_t)index < _pImpl->drawnRects.size()) _pImpl->drawnRects[index] = cell;
+  _pImpl->canvas->update(cell);
+}
+
+// Fits the item's crop to its cell (the crop of a new or turned photo has
+// the photo's proportions, not the cell's) and redraws the cell with a new
+// surface.
+void CLyMultiGrid::__updateGridImage(int index) {
+  if (!__isValidItemIndex(index) || !_pImpl->drawRectList) {
+    LYLOG_E("Invalid index [%d]", index);
+    return;
+  }
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList->get(index);
+  const CLyFloatRectangle d = _pImpl->drawRectList->get(index);
+  const CLyRectangle* old = item->getSrcRect();
+  CLyRectangle crop;
+  if (item->getBitmap() && old && __calculateRectSize(*old, d, crop)) {
+    CLyRectangle* owned = new (std::nothrow) CLyRectangle(crop);
+    if (owned) item->setSrcRect(owned);
+  }
+  __updateImage(index, d, true);
+}
+
+void CLyMultiGrid::updateBitmap(Bitmap* bitmap, int index, bool adoptPixels) {
+  if (!_pImpl) return;
+  if (!bitmap) {
+    LYLOG_E("Invalid buffer");
+    return;
+  }
+  if (index == -1) index = _pImpl->currentIndex;
+  if (!__isValidItemIndex(index)) {
+    LYLOG_E("Invalid index [%d]", index);
+    delete bitmap;  // ours to keep or drop: nobody else holds it
+    return;
+  }
+  // The cell's surface wraps the pixels about to be replaced: drop it first.
+  if ((size_t)index < _pImpl->surfaces.size() && _pImpl->surfaces[index]) {
+    cairo_surface_destroy(_pImpl->surfaces[index]);
+    _pImpl->surfaces[index] = nullptr;
+  }
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList->get(index);
+  Bitmap* current = item->getBitmap();
+  if (!adoptPixels || !current) {
+    item->setBitmap(bitmap, true);
+  } else {
+    const bool sameSize =
+        current->getWidth() == bitmap->getWidth() && current->getHeight() == bitmap->getHeight();
+    const int w = bitmap->getWidth(), h = bitmap->getHeight(), format = bitmap->getFormat();
+    current->adopt(bitmap->release(), w, h, format);
+    delete bitmap;
+    if (!sameSize) item->refresh();
+  }
+  __updateGridImage(index);
+}
+
+void CLyMultiGrid::rotate() {
+  if (!_pImpl) return;
+  __rotateGridImage(_pImpl->currentIndex, -M_PI / 2);
+  notifyChanged(true);
+}
+
+void CLyMultiGrid::__rotateGridImage(int index, double angle) {
+  if (!__isValidItemIndex(index) || !_pImpl->drawRectList) {
+    LYLOG_E("Invalid index [%d]", index);
+    return;
+  }
+  LYLOG_D("degrees: %f", angle * 180.0 / M_PI);
+  if (std::fabs(angle + M_PI / 2) > 1e-9) return;
+  CLyMultiGridSrcItem* item = _pImpl->srcItemList->get(index);
+  if (!item->getBitmap()) {
+    LYLOG_E("Invalid buffer");
+    return;
+  }
+  if ((size_t)index < _pImpl->surfaces.size() && _pImpl->surfaces[index]) {
+    cairo_surface_destroy(_pImpl->surfaces[index]);
+    _pImpl->surfaces[index] = nullptr;
+  }
+  item->rotate(3);
+  __updateGridImage(index);
+}
+
+// ---------------------------------------------------------------- saving
+
+bool CLyMultiGrid::save(const std::string& path) {
+  if (!_pImpl || !_pImpl->canvas || !_pImpl->canvasImage || !_pImpl->bgDrawRoi) {
+    LYLOG_E("Not initialized!");
+    return false;
+  }
+  if (path.empty()) {
+    LYLOG_E("Invalid path");
+    return false;
+  }
+  const CLyRectangle roi = *_pImpl->bgDrawRoi;
+  Evas_Object* image = evas_object_image_filled_add(evas_object_evas_get(_pImpl->canvasImage));
+  if (!image) return false;
+  evas_object_image_colorspace_set(image, EVAS_COLORSPACE_ARGB8888);
+  evas_object_image_alpha_set(image, EINA_FALSE);
+  CLyCairoCanvas* canvas = new (std::nothrow) CLyCairoCanvas(image, roi, false);
+  if (!canvas || !canvas->isValid()) {
+    LYLOG_E("Failed to add canvas");
+    delete canvas;
+    evas_object_del(image);
+    return false;
+  }
+  const CLyFloatRectangle area((float)roi.x, (float)roi.y, (float)roi.w, (float)roi.h);
+  const CLyRectangle& c = _pImpl->bgColor;
+  canvas->fillRect(CLyFloatRectangle(c.x / 255.0f, c.y / 255.0f, c.w / 255.0f, c.h / 255.0f), area);
+  // The drawn collage over the background: its transparent gaps show the
+  // colour. The collage pixels are read in place rather than copied.
+  LYLOG_D("size: %d", roi.w * roi.h * 4);
+  cairo_surface_t* drawn = _pImpl->canvas->getSurface();
+  cairo_surface_flush(drawn);
+  canvas->setFilter(CAIRO_FILTER_NEAREST);  // same size: a straight copy
+  canvas->beginPath();
+  canvas->setRectPath(area);
+  canvas->drawBitmap(drawn, area, CLyRectangle(0, 0, roi.w, roi.h));
+  canvas->update();
+  delete canvas;
+
+  // Written under a temporary name next to the target and renamed only when
+  // complete, so a failure never leaves a partial file under the real name.
+  const std::string temporary = temporaryPathFor(path);
+  Eina_Bool written = evas_object_image_save(image, temporary.c_str(), nullptr, nullptr);
+  evas_object_del(image);
+  if (!written || !isCompleteJpeg(temporary.c_str())) {
+    LYLOG_E("evas_object_image_save failed");
+    unlink(temporary.c_str());
+    return false;
+  }
+  if (rename(temporary.c_str(), path.c_str()) != 0) {
+    LYLOG_E("evas_object_image_save failed");
+    unlink(temporary.c_str());
+    return false;
+  }
+  LYLOG_I("evas_object_image_save success");
+  if (!CLyUtil::mediaContentScanFile(path.c_str())) {
+    // Reported as failed, so leave nothing behind for the user to find.
+    unlink(path.c_str());
+    return false;
+  }
+  return true;
+}

@@ -1,0 +1,1 @@
+#include "model/size-modifier/CLySizeModifierBase.h"

@@ -1,0 +1,11 @@
+#pragma once
+// Size-modifier rule of the grid layout(s) 3: 4 (image count: layout index).
+
+#include "model/size-modifier/CLySizeModifierInter.h"
+
+class CLySizeModifierGrid3Style5 : public CLySizeModifierInter {
+ public:
+  using CLySizeModifierInter::CLySizeModifierInter;
+  bool modifyX(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+  bool modifyY(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+};

@@ -1,0 +1,15 @@
+#pragma once
+// Size-modifier rule of the grid layout(s) 4: 5 (image count: layout index).
+
+#include "model/size-modifier/CLySizeModifierInter.h"
+
+class CLySizeModifierGrid4Style6 : public CLySizeModifierInter {
+ public:
+  using CLySizeModifierInter::CLySizeModifierInter;
+  bool modifyX(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+  bool modifyY(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+
+ private:
+  bool _focusImage2Y(float var, float limit, const std::vector<int32_t>& marks);
+  bool _focusImage4Y(float var, float limit, const std::vector<int32_t>& marks);
+};

@@ -1,0 +1,55 @@
+#include "model/size-modifier/CLySizeModifierGrid6Style5.h"
+
+bool CLySizeModifierGrid6Style5::modifyX(float var, float limit, int32_t /*count*/,
+                                         const std::vector<int32_t>& marks) {
+  switch (mFocusIndex) {
+    case 0:
+    case 1:
+    case 2:
+    case 3:
+      return _focusImage1X(var, limit, marks);
+    case 4:
+      return (mHandlerIndex == 0) ? _focusImage1X(var, limit, marks) : _focusImage5X(var, limit, marks);
+    case 5:
+      return _focusImage5X(var, limit, marks);
+    default:
+      return false;
+  }
+}
+
+bool CLySizeModifierGrid6Style5::modifyY(float var, float limit, int32_t /*count*/,
+                                         const std::vector<int32_t>& marks) {
+  switch (mFocusIndex) {
+    case 0:
+      return _focusImage1Y(var, limit, marks);
+    case 1:
+      return (mHandlerIndex == 0) ? _focusImage1Y(var, limit, marks) : _focusImage2Y(var, limit, marks);
+    case 2:
+    case 3:
+    case 4:
+    case 5:
+      return _focusImage2Y(var, limit, marks);
+    default:
+      return false;
+  }
+}
+
+// Divider {0, 1, 2} | {3, 4}.
+bool CLySizeModifierGrid6Style5::_focusImage1X(float var, float limit, const std::vector<int32_t>& marks) {
+  return _snapDivider(AXIS_X, var, limit, marks, {0, 1, 2}, {3, 4});
+}
+
+// Divider {4} | {5}.
+bool CLySizeModifierGrid6Style5::_focusImage5X(float var, float limit, const std::vector<int32_t>& marks) {
+  return _snapDivider(AXIS_X, var, limit, marks, {4}, {5});
+}
+
+// Divider {0} | {1}.
+bool CLySizeModifierGrid6Style5::_focusImage1Y(float var, float limit, const std::vector<int32_t>& marks) {
+  return _snapDivider(AXIS_Y, var, limit, marks, {0}, {1});
+}
+
+// Divider {1, 3} | {2, 4, 5}.
+bool CLySizeModifierGrid6Style5::_focusImage2Y(float var, float limit, const std::vector<int32_t>& marks) {
+  return _snapDivider(AXIS_Y, var, limit, marks, {1, 3}, {2, 4, 5});
+}

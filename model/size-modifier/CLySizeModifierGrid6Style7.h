@@ -1,0 +1,18 @@
+#pragma once
+// Size-modifier rule of the grid layout(s) 6: 6 (image count: layout index).
+
+#include "model/size-modifier/CLySizeModifierInter.h"
+
+class CLySizeModifierGrid6Style7 : public CLySizeModifierInter {
+ public:
+  using CLySizeModifierInter::CLySizeModifierInter;
+  bool modifyX(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+  bool modifyY(float var, float limit, int32_t count, const std::vector<int32_t>& marks) override;
+
+ private:
+  bool _focusImage1X(float var, float limit, const std::vector<int32_t>& marks);
+  bool _focusImage2X(float var, float limit, const std::vector<int32_t>& marks);
+  bool _focusImage1Y(float var, float limit, const std::vector<int32_t>& marks);
+  bool _focusImage3Y(float var, float limit, const std::vector<int32_t>& marks);
+  bool _focusImage5Y(float var, float limit, const std::vector<int32_t>& marks);
+};

@@ -1,0 +1,181 @@
+#include "platform/efl_extension.h"
+
+#include <Elementary.h>
+
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
+#include <map>
+#include <vector>
+
+#include "common/CLyLog.h"
+
+namespace {
+
+struct Callback {
+  Eext_Callback_Type type;
+  Eext_Event_Cb func;
+  void* data;
+};
+
+// The objects with key callbacks; `stamp` orders them by their last
+// registration or show, the latest one being on top.
+struct ObjectRecord {
+  Evas_Object* obj;
+  uint64_t stamp;
+  std::vector<Callback> callbacks;
+};
+
+std::vector<ObjectRecord*> gRecords;
+// One invisible key catcher per canvas holds the key grabs.
+std::map<Evas*, Evas_Object*> gCatchers;
+uint64_t gStamp = 0;
+
+const char* const kBackKeys[] = {"Escape", "XF86Back"};
+const char* const kMoreKeys[] = {"Menu", "XF86Menu"};
+
+ObjectRecord* findRecord(Evas_Object* obj) {
+  for (ObjectRecord* record : gRecords)
+    if (record->obj == obj) return record;
+  return nullptr;
+}
+
+bool reallyVisible(Evas_Object* obj) {
+  for (Evas_Object* o = obj; o; o = evas_object_smart_parent_get(o))
+    if (!evas_object_visible_get(o)) return false;
+  return true;
+}
+
+bool hasType(const ObjectRecord* record, Eext_Callback_Type type) {
+  return std::any_of(record->callbacks.begin(), record->callbacks.end(),
+                     [type](const Callback& cb) { return cb.type == type; });
+}
+
+void dispatch(Evas* evas, Eext_Callback_Type type) {
+  ObjectRecord* target = nullptr;
+  for (ObjectRecord* record : gRecords) {
+    if (evas_object_evas_get(record->obj) != evas || !hasType(record, type) || !reallyVisible(record->obj))
+      continue;
+    if (!target || record->stamp > target->stamp) target = record;
+  }
+  if (!target) return;
+  Evas_Object* obj = target->obj;
+  // A callback may delete the object or change the callbacks: run a
+  // snapshot, skipping entries that are gone by their turn.
+  std::vector<Callback> snapshot = target->callbacks;
+  for (const Callback& cb : snapshot) {
+    if (cb.type != type) continue;
+    ObjectRecord* record = findRecord(obj);
+    if (!record) break;
+    bool present = std::any_of(record->callbacks.begin(), record->callbacks.end(), [&cb](const Callback& c) {
+      return c.type == cb.type && c.func == cb.func && c.data == cb.data;
+    });
+    if (present) cb.func(cb.data, obj, nullptr);
+  }
+}
+
+bool matches(const char* key, const char* const* names, size_t count) {
+  for (size_t i = 0; i < count; ++i)
+    if (strcmp(key, names[i]) == 0) return true;
+  return false;
+}
+
+void onKeyDown(void*, Evas* evas, Evas_Object*, void* event_info) {
+  auto* ev = static_cast<Evas_Event_Key_Down*>(event_info);
+  if (!ev || !ev->keyname) return;
+  if (matches(ev->keyname, kBackKeys, 2))
+    dispatch(evas, EEXT_CALLBACK_BACK);
+  else if (matches(ev->keyname, kMoreKeys, 2))
+    dispatch(evas, EEXT_CALLBACK_MORE);
+}
+
+void onCatcherDel(void*, Evas* evas, Evas_Object*, void*) {
+  gCatchers.erase(evas);
+}
+
+void ensureCatcher(Evas* evas) {
+  if (!evas || gCatchers.count(evas)) return;
+  Evas_Object* catcher = evas_object_rectangle_add(evas);
+  if (!catcher) {
+    LYLOG_E("Cannot create the key catcher");
+    return;
+  }
+  evas_object_name_set(catcher, "eext-key-catcher");
+  evas_object_pass_events_set(catcher, EINA_TRUE);
+  for (const char* const* keys : {kBackKeys, kMoreKeys})
+    for (size_t i = 0; i < 2; ++i)
+      if (!evas_object_key_grab(catcher, keys[i], 0, 0, EINA_FALSE)) LYLOG_W("Cannot grab %s", keys[i]);
+  evas_object_event_callback_add(catcher, EVAS_CALLBACK_KEY_DOWN, onKeyDown, nullptr);
+  evas_object_event_callback_add(catcher, EVAS_CALLBACK_DEL, onCatcherDel, nullptr);
+  gCatchers[evas] = catcher;
+}
+
+void onObjectShow(void*, Evas*, Evas_Object* obj, void*) {
+  if (ObjectRecord* record = findRecord(obj)) record->stamp = ++gStamp;
+}
+
+void removeRecord(Evas_Object* obj);
+
+void onObjectDel(void*, Evas*, Evas_Object* obj, void*) {
+  removeRecord(obj);
+}
+
+void removeRecord(Evas_Object* obj) {
+  auto it = std::find_if(gRecords.begin(), gRecords.end(), [obj](ObjectRecord* r) { return r->obj == obj; });
+  if (it == gRecords.end()) return;
+  delete *it;
+  gRecords.erase(it);
+  evas_object_event_callback_del(obj, EVAS_CALLBACK_SHOW, onObjectShow);
+  evas_object_event_callback_del(obj, EVAS_CALLBACK_DEL, onObjectDel);
+}
+
+}  // namespace
+
+void eext_object_event_callback_add(Evas_Object* obj, Eext_Callback_Type type, Eext_Event_Cb func,
+                                    void* data) {
+  if (!obj || !func || type < EEXT_CALLBACK_BACK || type >= EEXT_CALLBACK_LAST) {
+    LYLOG_E("Invalid parameter");
+    return;
+  }
+  ensureCatcher(evas_object_evas_get(obj));
+  ObjectRecord* record = findRecord(obj);
+  if (!record) {
+    record = new ObjectRecord{obj, 0, {}};
+    gRecords.push_back(record);
+    evas_object_event_callback_add(obj, EVAS_CALLBACK_SHOW, onObjectShow, nullptr);
+    evas_object_event_callback_add(obj, EVAS_CALLBACK_DEL, onObjectDel, nullptr);
+  }
+  record->stamp = ++gStamp;
+  record->callbacks.push_back({type, func, data});
+}
+
+void* eext_object_event_callback_del(Evas_Object* obj, Eext_Callback_Type type, Eext_Event_Cb func) {
+  ObjectRecord* record = obj ? findRecord(obj) : nullptr;
+  if (!record) return nullptr;
+  auto it = std::find_if(record->callbacks.begin(), record->callbacks.end(),
+                         [type, func](const Callback& cb) { return cb.type == type && cb.func == func; });
+  if (it == record->callbacks.end()) return nullptr;
+  void* data = it->data;
+  record->callbacks.erase(it);
+  if (record->callbacks.empty()) removeRecord(obj);
+  return data;
+}
+
+void eext_naviframe_back_cb(void*, Evas_Object* obj, void*) {
+  if (obj) elm_naviframe_item_pop(obj);
+}
+
+void eext_naviframe_more_cb(void*, Evas_Object* obj, void*) {
+  Elm_Object_Item* top = obj ? elm_naviframe_top_item_get(obj) : nullptr;
+  if (!top) return;
+  if (Evas_Object* more = elm_object_item_part_content_get(top, "toolbar_more_btn"))
+    evas_object_smart_callback_call(more, "clicked", nullptr);
+}
+
+void eext_ctxpopup_back_cb(void*, Evas_Object* obj, void*) {
+  if (obj) elm_ctxpopup_dismiss(obj);
+}
+
+void eext_popup_back_cb(void*, Evas_Object* obj, void*) {
+  if (obj) evas_object_del(obj);
+}

@@ -1,0 +1,28 @@
+#include "platform/image-filter/filter_frame.h"
+
+namespace imgfilter {
+
+GrainTile::GrainTile(uint64_t seed, int amp) : mTile(256 * 256) {
+  Rng rng(seed);
+  for (int8_t& v : mTile) {
+    uint64_t bits = rng.next();
+    // Sum of two uniforms: a soft, film-like distribution.
+    double u = ((bits & 0xffff) + ((bits >> 16) & 0xffff)) / 65535.0 - 1.0;
+    v = (int8_t)std::lround(u * amp);
+  }
+}
+
+Vignette::Vignette(int width, int height, double strength) : col((size_t)width), row((size_t)height) {
+  // Each profile darkens by k at its edge, so a corner gets (1 - k)^2 = 1 - strength.
+  double k = 1.0 - std::sqrt(clamp01(1.0 - strength));
+  auto fill = [k](std::vector<uint16_t>& out, int n) {
+    for (int i = 0; i < n; ++i) {
+      double u = n > 1 ? std::fabs(2.0 * i / (n - 1) - 1.0) : 0.0;
+      out[(size_t)i] = (uint16_t)std::lround(256.0 * (1.0 - k * std::pow(u, 2.4)));
+    }
+  };
+  fill(col, width);
+  fill(row, height);
+}
+
+}  // namespace imgfilter

@@ -1,0 +1,210 @@
+#include "platform/image-filter/filter_resample.h"
+
+#include <algorithm>
+#include <cmath>
+
+namespace imgfilter {
+
+int reductionFor(int shortSide, int target) {
+  int f = target > 0 ? shortSide / target : 1;
+  return f < 1 ? 1 : f;
+}
+
+int boxRadiusForSigma(double sigma) {
+  // Three passes of a box of width n have variance (n^2 - 1) / 4.
+  double n = std::sqrt(4.0 * sigma * sigma + 1.0);
+  int r = (int)std::lround((n - 1.0) / 2.0);
+  return r < 1 ? 1 : r;
+}
+
+void downscale(const Frame& f, int factor, Rgba& out) {
+  const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
+  out.resize(sw, sh);
+  const Channels c = f.ch;
+  if (factor == 1) {
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = out.row(y);
+      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
+        d[0] = s[c.r];
+        d[1] = s[c.g];
+        d[2] = s[c.b];
+        d[3] = s[c.a];
+      }
+    }
+    return;
+  }
+  std::vector<uint32_t> acc((size_t)sw * 4);
+  for (int by = 0; by < sh; ++by) {
+    std::fill(acc.begin(), acc.end(), 0u);
+    const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
+    for (int y = y0; y < y1; ++y) {
+      const uint8_t* s = f.srcRow(y);
+      for (int bx = 0; bx < sw; ++bx) {
+        const int x1 = std::min(f.width, (bx + 1) * factor);
+        uint32_t r = 0, g = 0, b = 0, a = 0;
+        for (int x = bx * factor; x < x1; ++x) {
+          const uint8_t* p = s + (size_t)x * 4;
+          r += p[c.r];
+          g += p[c.g];
+          b += p[c.b];
+          a += p[c.a];
+        }
+        uint32_t* q = &acc[(size_t)bx * 4];
+        q[0] += r;
+        q[1] += g;
+        q[2] += b;
+        q[3] += a;
+      }
+    }
+    uint8_t* d = out.row(by);
+    const int rows = y1 - y0;
+    for (int bx = 0; bx < sw; ++bx) {
+      const int cols = std::min(f.width, (bx + 1) * factor) - bx * factor;
+      const uint32_t n = (uint32_t)(rows * cols);
+      for (int k = 0; k < 4; ++k) d[bx * 4 + k] = (uint8_t)((acc[(size_t)bx * 4 + k] + n / 2) / n);
+    }
+  }
+}
+
+void downscaleLuma(const Frame& f, int factor, Gray& out) {
+  const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
+  out.resize(sw, sh);
+  const Channels c = f.ch;
+  if (factor == 1) {
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = out.row(y);
+      for (int x = 0; x < f.width; ++x, s += 4) d[x] = (uint8_t)luma709(s[c.r], s[c.g], s[c.b]);
+    }
+    return;
+  }
+  std::vector<uint32_t> acc((size_t)sw);
+  for (int by = 0; by < sh; ++by) {
+    std::fill(acc.begin(), acc.end(), 0u);
+    const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
+    for (int y = y0; y < y1; ++y) {
+      const uint8_t* s = f.srcRow(y);
+      for (int x = 0; x < f.width; ++x, s += 4) acc[(size_t)(x / factor)] += (uint32_t)luma709(s[c.r], s[c.g], s[c.b]);
+    }
+    uint8_t* d = out.row(by);
+    const int rows = y1 - y0;
+    for (int bx = 0; bx < sw; ++bx) {
+      const uint32_t n = (uint32_t)(rows * (std::min(f.width, (bx + 1) * factor) - bx * factor));
+      d[bx] = (uint8_t)((acc[(size_t)bx] + n / 2) / n);
+    }
+  }
+}
+
+namespace {
+
+template <int N>
+void blurRows(Image<N>& img, int r) {
+  const int w = img.w;
+  const uint64_t inv = (1ull << 24) / (uint64_t)(2 * r + 1);
+  std::vector<uint8_t> line((size_t)(w + 2 * r + 1) * N);
+  for (int y = 0; y < img.h; ++y) {
+    uint8_t* row = img.row(y);
+    // Edge pixels repeat beyond both ends.
+    for (int i = 0; i < w + 2 * r + 1; ++i) {
+      const int x = std::clamp(i - r, 0, w - 1);
+      for (int k = 0; k < N; ++k) line[(size_t)i * N + k] = row[(size_t)x * N + k];
+    }
+    uint32_t sum[N] = {};
+    for (int i = 0; i < 2 * r + 1; ++i)
+      for (int k = 0; k < N; ++k) sum[k] += line[(size_t)i * N + k];
+    const uint8_t* add = line.data() + (size_t)(2 * r + 1) * N;
+    const uint8_t* sub = line.data();
+    for (int x = 0; x < w; ++x) {
+      for (int k = 0; k < N; ++k) {
+        row[(size_t)x * N + k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);
+        sum[k] += (uint32_t)add[k] - (uint32_t)sub[k];
+      }
+      add += N;
+      sub += N;
+    }
+  }
+}
+
+template <int N>
+void blurColumns(Image<N>& img, int r, Image<N>& out) {
+  const int w = img.w, h = img.h;
+  const size_t n = (size_t)w * N;
+  const uint64_t inv = (1ull << 24) / (uint64_t)(2 * r + 1);
+  out.resize(w, h);
+  std::vector<uint32_t> sum(n, 0u);
+  for (int i = -r; i <= r; ++i) {
+    const uint8_t* s = img.row(std::clamp(i, 0, h - 1));
+    for (size_t k = 0; k < n; ++k) sum[k] += s[k];
+  }
+  for (int y = 0; y < h; ++y) {
+    uint8_t* d = out.row(y);
+    const uint8_t* add = img.row(std::min(y + r + 1, h - 1));
+    const uint8_t* sub = img.row(std::max(y - r, 0));
+    for (size_t k = 0; k < n; ++k) {
+      d[k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);
+      sum[k] += (uint32_t)add[k] - (uint32_t)sub[k];
+    }
+  }
+}
+
+}  // namespace
+
+template <int N>
+void boxBlur(Image<N>& img, int radius, int passes) {
+  if (radius < 1 || img.w < 1 || img.h < 1) return;
+  for (int p = 0; p < passes; ++p) blurRows(img, radius);
+  Image<N> tmp;
+  for (int p = 0; p < passes; ++p) {
+    blurColumns(img, radius, tmp);
+    std::swap(img.px, tmp.px);
+  }
+}
+
+template <int N>
+Upsampler<N>::Upsampler(const Image<N>& small, int factor, int fullWidth, int fullHeight)
+    : mSmall(small),
+      mFactor(factor),
+      mWidth(fullWidth),
+      mHeight(fullHeight),
+      mX0((size_t)fullWidth),
+      mWx((size_t)fullWidth),
+      mTmp((size_t)small.w * N),
+      mOut((size_t)fullWidth * N) {
+  for (int x = 0; x < fullWidth; ++x) {
+    double u = (x + 0.5) / factor - 0.5;
+    u = std::clamp(u, 0.0, (double)(small.w - 1));
+    int x0 = std::min((int)u, small.w - 1);
+    mX0[(size_t)x] = x0;
+    mWx[(size_t)x] = (uint16_t)std::lround((u - x0) * 256.0);
+  }
+}
+
+template <int N>
+const uint8_t* Upsampler<N>::row(int y) {
+  if (mFactor == 1) return mSmall.row(std::clamp(y, 0, mSmall.h - 1));
+  double v = std::clamp((y + 0.5) / mFactor - 0.5, 0.0, (double)(mSmall.h - 1));
+  const int y0 = std::min((int)v, mSmall.h - 1), y1 = std::min(y0 + 1, mSmall.h - 1);
+  const uint32_t wy = (uint32_t)std::lround((v - y0) * 256.0);
+  const uint8_t* a = mSmall.row(y0);
+  const uint8_t* b = mSmall.row(y1);
+  for (size_t k = 0; k < mTmp.size(); ++k) mTmp[k] = (uint16_t)(a[k] * (256u - wy) + b[k] * wy);
+  const int lastX = mSmall.w - 1;
+  uint8_t* out = mOut.data();
+  for (int x = 0; x < mWidth; ++x) {
+    const int x0 = mX0[(size_t)x];
+    const int x1 = x0 < lastX ? x0 + 1 : x0;
+    const uint32_t wx = mWx[(size_t)x];
+    const uint16_t* p = &mTmp[(size_t)x0 * N];
+    const uint16_t* q = &mTmp[(size_t)x1 * N];
+    for (int k = 0; k < N; ++k) out[(size_t)x * N + k] = (uint8_t)((p[k] * (256u - wx) + q[k] * wx + 32768u) >> 16);
+  }
+  return out;
+}
+
+template void boxBlur<1>(Image<1>&, int, int);
+template void boxBlur<4>(Image<4>&, int, int);
+template class Upsampler<1>;
+template class Upsampler<4>;
+
+}  // namespace imgfilter

@@ -1,0 +1,17 @@
+#pragma once
+// Helpers of the touch tests: unit scale and fed input on a buffer canvas.
+
+#include <Elementary.h>
+
+#include "tests/support/TestSupport.h"
+
+namespace pictavo::test::touch {
+
+// Scaled sizes equal design sizes (elm scale 1 over base scale 1).
+inline void setUnitScale() {
+  ensureElm();
+  elm_app_base_scale_set(1.0);
+  elm_config_scale_set(1.0);
+}
+
+}  // namespace pictavo::test::touch
