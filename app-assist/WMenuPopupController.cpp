@@ -2,6 +2,7 @@
 
 #include <vector>
 
+#include "app-assist/IWEvasObject.h"
 #include "common/CLyLog.h"
 #include "platform/efl_extension.h"
 
@@ -15,6 +16,10 @@ Evas_Object* gCurrentMenu = nullptr;
 struct _WMenuPopupControllerImpl {
   Evas_Object* _win = nullptr;
   Evas_Object* _layout = nullptr;
+  // The window and layout may go before the menu (or be half-deleted when
+  // it goes): their callbacks are only removed while they still exist.
+  std::weak_ptr<IWEvasObject> _winRef;
+  std::weak_ptr<IWEvasObject> _layoutRef;
   Evas_Object* _ctxpopup = nullptr;
   std::vector<std::function<void()>> _itemCallbacks;
 };
@@ -50,17 +55,18 @@ Evas_Object* WMenuPopupController::onCreateView(Evas_Object*, void*) {
   eext_object_event_callback_add(ctx, EEXT_CALLBACK_BACK, __onBackKey, this);
   eext_object_event_callback_add(ctx, EEXT_CALLBACK_MORE, __onBackKey, this);
   if (_mp->_layout) {
+    _mp->_layoutRef = wevasobject_get_weak_ptr(_mp->_layout);
     evas_object_event_callback_add(_mp->_layout, EVAS_CALLBACK_RESIZE, __onLayoutResize, this);
-    evas_object_event_callback_add(_mp->_layout, EVAS_CALLBACK_DEL, __onWatchedDel, this);
   }
+  _mp->_winRef = wevasobject_get_weak_ptr(_mp->_win);
   evas_object_smart_callback_add(_mp->_win, "rotation,changed", __onRotationChanged, this);
-  evas_object_event_callback_add(_mp->_win, EVAS_CALLBACK_DEL, __onWatchedDel, this);
   elm_ctxpopup_direction_priority_set(ctx, ELM_CTXPOPUP_DIRECTION_DOWN, ELM_CTXPOPUP_DIRECTION_UP,
                                       ELM_CTXPOPUP_DIRECTION_UNKNOWN, ELM_CTXPOPUP_DIRECTION_UNKNOWN);
   evas_object_smart_callback_add(ctx, "dismissed", __onDismissed, this);
   evas_object_smart_callback_add(ctx, "language,changed", __onDismissed, this);
-  // Runs before the view controller's own deletion handling (registered later).
-  evas_object_event_callback_add(ctx, EVAS_CALLBACK_DEL, __onMenuDel, this);
+  // Must run before the view controller's own deletion handling deletes this.
+  evas_object_event_callback_priority_add(ctx, EVAS_CALLBACK_DEL, EVAS_CALLBACK_PRIORITY_BEFORE, __onMenuDel,
+                                          this);
   _mp->_ctxpopup = ctx;
   gCurrentMenu = ctx;
   return ctx;
@@ -69,33 +75,19 @@ Evas_Object* WMenuPopupController::onCreateView(Evas_Object*, void*) {
 void WMenuPopupController::__onMenuDel(void* data, Evas*, Evas_Object* obj, void*) {
   auto* self = static_cast<WMenuPopupController*>(data);
   if (gCurrentMenu == obj) gCurrentMenu = nullptr;
-  if (self->_mp->_layout) {
-    evas_object_event_callback_del_full(self->_mp->_layout, EVAS_CALLBACK_RESIZE, __onLayoutResize, self);
-    evas_object_event_callback_del_full(self->_mp->_layout, EVAS_CALLBACK_DEL, __onWatchedDel, self);
-  }
-  if (self->_mp->_win) {
-    evas_object_smart_callback_del_full(self->_mp->_win, "rotation,changed", __onRotationChanged, self);
-    evas_object_event_callback_del_full(self->_mp->_win, EVAS_CALLBACK_DEL, __onWatchedDel, self);
-  }
+  if (auto layout = self->_mp->_layoutRef.lock())
+    evas_object_event_callback_del_full(layout->getEvasObj(), EVAS_CALLBACK_RESIZE, __onLayoutResize, self);
+  if (auto win = self->_mp->_winRef.lock())
+    evas_object_smart_callback_del_full(win->getEvasObj(), "rotation,changed", __onRotationChanged, self);
+  self->_mp->_layoutRef.reset();
+  self->_mp->_winRef.reset();
   self->_mp->_layout = nullptr;
   self->_mp->_win = nullptr;
   self->_mp->_ctxpopup = nullptr;
 }
 
-void WMenuPopupController::__onWatchedDel(void* data, Evas*, Evas_Object* obj, void*) {
-  auto* self = static_cast<WMenuPopupController*>(data);
-  if (obj == self->_mp->_layout) {
-    evas_object_event_callback_del_full(obj, EVAS_CALLBACK_RESIZE, __onLayoutResize, self);
-    self->_mp->_layout = nullptr;
-  }
-  if (obj == self->_mp->_win) {
-    evas_object_smart_callback_del_full(obj, "rotation,changed", __onRotationChanged, self);
-    self->_mp->_win = nullptr;
-  }
-}
-
 void WMenuPopupController::_move() {
-  if (!_mp->_ctxpopup || !_mp->_win) return;
+  if (!_mp->_ctxpopup || _mp->_winRef.expired()) return;
   int w = 0, h = 0;
   elm_win_screen_size_get(_mp->_win, nullptr, nullptr, &w, &h);
   int rotation = elm_win_rotation_get(_mp->_win);

@@ -256,7 +256,7 @@ int render(const Options& o) {
   cells.clear(true);
   items.clear(true);
   if (!saved) {
-    fprintf(stderr, "pictavo: the collage could not be written to %s (see the log above)\n", o.out.c_str());
+    fprintf(stderr, "pictavo: the collage could not be written to %s (PICTAVO_LOG_LEVEL=E shows why)\n", o.out.c_str());
     return LY_RENDER_FAILED;
   }
   char* real = realpath(o.out.c_str(), nullptr);
@@ -273,6 +273,10 @@ int runRenderCommand(int argc, char** argv) {
   if (status >= 0) return status;
   // Headless whatever the environment: the picture goes to a file only.
   setenv("ELM_ENGINE", "buffer", 1);
+  // The command reports every failure itself; the application's log joins
+  // in only when asked for (PICTAVO_LOG_LEVEL, EINA_LOG_LEVEL).
+  if (!getenv("PICTAVO_LOG_LEVEL")) dlog_set_min_priority(DLOG_FATAL);
+  setenv("EINA_LOG_LEVEL", "0", 0);
   setenv("ECORE_NO_SYSTEM_MODULES", "1", 0);
   setenv("EINA_LOG_BACKTRACE", "-1", 0);
   if (!elm_init(argc, argv)) {

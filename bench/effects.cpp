@@ -46,14 +46,25 @@ struct Target {
 
 Target targetOf(int code) {
   switch (code) {
-    case 602: case 210: case 211: case 201: return {"blur/glow/sharpen/cartoon", 30};
-    case 603: case 212: return {"grade + glow", 30};
-    case 608: case 609: return {"light", 15};
-    default: return {"matrix/curve", 5};
+    case 602:
+    case 210:
+    case 211:
+    case 201:
+      return {"blur/glow/sharpen/cartoon", 30};
+    case 603:
+    case 212:
+      return {"grade + glow", 30};
+    case 608:
+    case 609:
+      return {"light", 15};
+    default:
+      return {"matrix/curve", 5};
   }
 }
 
-inline uint32_t clamp255(uint32_t v) { return v > 255 ? 255 : v; }
+inline uint32_t clamp255(uint32_t v) {
+  return v > 255 ? 255 : v;
+}
 
 // The plain-C peers of the shared peer baseline, xRGB words in and out.
 void sepiaC(uint32_t* __restrict d, const uint32_t* __restrict s, size_t n) {
@@ -79,7 +90,8 @@ void runPillow(int runs) {
       "from PIL import Image, ImageEnhance\n"
       "runs=int(sys.argv[1])\n"
       "src=Image.effect_noise((2000,1500),40).convert('RGB')\n"
-      "src=Image.merge('RGB',(src.getchannel(0),src.rotate(90,expand=0).getchannel(0),src.transpose(0).getchannel(0)))\n"
+      "src=Image.merge('RGB',(src.getchannel(0),src.rotate(90,expand=0).getchannel(0),src.transpose(0)."
+      "getchannel(0)))\n"
       "def t(name,fn):\n"
       "  fn(); ts=[]\n"
       "  for _ in range(runs):\n"
@@ -87,7 +99,8 @@ void runPillow(int runs) {
       "  print(f'{name} {statistics.median(ts):.2f}')\n"
       "sep=(0.393,0.769,0.189,0,0.349,0.686,0.168,0,0.272,0.534,0.131,0)\n"
       "t('pillow_sepia_matrix',lambda: src.convert('RGB',sep))\n"
-      "t('pillow_grey_contrast',lambda: ImageEnhance.Contrast(src.convert('L')).enhance(1.3).convert('RGB'))\n";
+      "t('pillow_grey_contrast',lambda: "
+      "ImageEnhance.Contrast(src.convert('L')).enhance(1.3).convert('RGB'))\n";
   std::string cmd = "/usr/bin/python3 -c \"$PICTAVO_PILLOW_SCRIPT\" " + std::to_string(runs) + " 2>/dev/null";
   setenv("PICTAVO_PILLOW_SCRIPT", script, 1);
   FILE* p = popen(cmd.c_str(), "r");
@@ -118,8 +131,8 @@ int main(int argc, char** argv) {
   std::vector<uint8_t> out(photo9.size());
 
   printf("# effects on %dx%d, single thread, median of %d runs after 1 warm-up (ms)\n", kW, kH, runs);
-  printf("%-3s %-13s %-5s %9s %9s %9s %7s  %s\n", "#", "effect", "code", "look", "engine/8", "engine/9", "target",
-         "class");
+  printf("%-3s %-13s %-5s %9s %9s %9s %7s  %s\n", "#", "effect", "code", "look", "engine/8", "engine/9",
+         "target", "class");
   int misses = 0;
   for (int i = 0; i < IE_Engine_Effect_Count(); ++i) {
     const IeEffect* e = IE_Engine_Effect_Get(i);
@@ -148,10 +161,12 @@ int main(int argc, char** argv) {
     label = label.substr(label.find('_', 4) + 1);
     label = label.substr(label.find('_') + 1);
     label = label.substr(0, label.find("_M_"));
-    printf("%-3d %-13.13s %-5d %9.2f %9.2f %9.2f %5.0f%s  %s\n", i + 1, label.c_str(), code, look, e8, e9, t.ms,
-           ok ? "  " : " !", t.kind);
+    printf("%-3d %-13.13s %-5d %9.2f %9.2f %9.2f %5.0f%s  %s\n", i + 1, label.c_str(), code, look, e8, e9,
+           t.ms, ok ? "  " : " !", t.kind);
   }
-  printf("# look = image filter alone; engine/8, engine/9 = IE_Engine_Apply_Effect with a format-8 / format-9 source\n");
+  printf(
+      "# look = image filter alone; engine/8, engine/9 = IE_Engine_Apply_Effect with a format-8 / format-9 "
+      "source\n");
   printf("# %d effect(s) above target (look column)\n", misses);
 
   printf("\n# peers, same run, same size (ms)\n");
@@ -161,7 +176,8 @@ int main(int argc, char** argv) {
   uint8_t lut[256];
   for (int i = 0; i < 256; ++i) lut[i] = (uint8_t)std::clamp((int)((i - 128) * 1.3 + 128), 0, 255);
   printf("%-34s %8.2f\n", "plain_c_sepia_matrix", medianMs(runs, [&] { sepiaC(xd.data(), xs.data(), n); }));
-  printf("%-34s %8.2f\n", "plain_c_grey_lut", medianMs(runs, [&] { greyLutC(xd.data(), xs.data(), n, lut); }));
+  printf("%-34s %8.2f\n", "plain_c_grey_lut",
+         medianMs(runs, [&] { greyLutC(xd.data(), xs.data(), n, lut); }));
   printf("%-34s %8.2f\n", "memcpy_12MB (bandwidth floor)",
          medianMs(runs, [&] { memcpy(xd.data(), xs.data(), n * 4); }));
   runPillow(runs);

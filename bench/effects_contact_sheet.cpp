@@ -19,15 +19,24 @@ constexpr int kTileW = 480, kTileH = 320, kCols = 5, kGap = 12, kLabelH = 34;
 
 const char* englishLabel(const char* id) {
   static const char* const kNames[][2] = {
-      {"IDS_IMGE_BUTTON_PASTEL_M_EFFECT_ABB", "Pastel"},     {"IDS_IMGE_BUTTON_DEEP_M_EFFECT_ABB", "Deep"},
-      {"IDS_IV_OPT_RETRO_M_EFFECT", "Retro"},                {"IDS_IMGE_BUTTON_FILM_M_EFFECT_ABB", "Film"},
-      {"IDS_IMGE_BUTTON_CALM_M_EFFECT_ABB", "Calm"},         {"IDS_IMGE_BUTTON_DAWN_M_EFFECT_ABB", "Dawn"},
-      {"IDS_IV_OPT_GREYSCALE_M_EFFECT", "Greyscale"},        {"IDS_IMGE_BUTTON_EVERGREEN_M_EFFECT_ABB", "Evergreen"},
-      {"IDS_IV_OPT_FADED_COLOURS_M_EFFECT", "Faded colours"}, {"IDS_IV_OPT_OLD_PHOTO_M_EFFECT", "Old photo"},
-      {"IDS_IV_OPT_BLUR_M_EFFECT", "Blur"},                  {"IDS_IV_OPT_NOSTALGIA_M_EFFECT", "Nostalgia"},
-      {"IDS_IV_OPT_SUNSHINE_M_EFFECT", "Sunshine"},          {"IDS_IV_OPT_VINTAGE_M_EFFECT", "Vintage"},
-      {"IDS_IV_OPT_SHARPEN_M_EFFECT", "Sharpen"},            {"IDS_IV_OPT_SOFT_GLOW_M_EFFECT", "Soft glow"},
-      {"IDS_IMGE_BUTTON_STARDUST_M_EFFECT_ABB", "Stardust"}, {"IDS_IMGE_BUTTON_LIGHT_FLARE_M_EFFECT", "Light flare"},
+      {"IDS_IMGE_BUTTON_PASTEL_M_EFFECT_ABB", "Pastel"},
+      {"IDS_IMGE_BUTTON_DEEP_M_EFFECT_ABB", "Deep"},
+      {"IDS_IV_OPT_RETRO_M_EFFECT", "Retro"},
+      {"IDS_IMGE_BUTTON_FILM_M_EFFECT_ABB", "Film"},
+      {"IDS_IMGE_BUTTON_CALM_M_EFFECT_ABB", "Calm"},
+      {"IDS_IMGE_BUTTON_DAWN_M_EFFECT_ABB", "Dawn"},
+      {"IDS_IV_OPT_GREYSCALE_M_EFFECT", "Greyscale"},
+      {"IDS_IMGE_BUTTON_EVERGREEN_M_EFFECT_ABB", "Evergreen"},
+      {"IDS_IV_OPT_FADED_COLOURS_M_EFFECT", "Faded colours"},
+      {"IDS_IV_OPT_OLD_PHOTO_M_EFFECT", "Old photo"},
+      {"IDS_IV_OPT_BLUR_M_EFFECT", "Blur"},
+      {"IDS_IV_OPT_NOSTALGIA_M_EFFECT", "Nostalgia"},
+      {"IDS_IV_OPT_SUNSHINE_M_EFFECT", "Sunshine"},
+      {"IDS_IV_OPT_VINTAGE_M_EFFECT", "Vintage"},
+      {"IDS_IV_OPT_SHARPEN_M_EFFECT", "Sharpen"},
+      {"IDS_IV_OPT_SOFT_GLOW_M_EFFECT", "Soft glow"},
+      {"IDS_IMGE_BUTTON_STARDUST_M_EFFECT_ABB", "Stardust"},
+      {"IDS_IMGE_BUTTON_LIGHT_FLARE_M_EFFECT", "Light flare"},
       {"IDS_IV_OPT_CARTOON_M_EFFECT", "Cartoon"},
   };
   for (const auto& n : kNames)
@@ -38,8 +47,8 @@ const char* englishLabel(const char* id) {
 void drawTile(cairo_t* cr, int index, std::vector<uint8_t>& pixels, const std::string& label) {
   const int col = index % kCols, row = index / kCols;
   const int x = kGap + col * (kTileW + kGap), y = kGap + row * (kTileH + kLabelH + kGap);
-  cairo_surface_t* tile = cairo_image_surface_create_for_data(pixels.data(), CAIRO_FORMAT_ARGB32, kTileW, kTileH,
-                                                              kTileW * 4);
+  cairo_surface_t* tile =
+      cairo_image_surface_create_for_data(pixels.data(), CAIRO_FORMAT_ARGB32, kTileW, kTileH, kTileW * 4);
   cairo_set_source_surface(cr, tile, x, y);
   cairo_paint(cr);
   cairo_surface_destroy(tile);

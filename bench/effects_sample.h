@@ -16,7 +16,9 @@ inline uint32_t hash2(int x, int y, uint32_t seed) {
   h = (h ^ (h >> 13)) * 1274126177u;
   return h ^ (h >> 16);
 }
-inline double rnd(int x, int y, uint32_t seed) { return (hash2(x, y, seed) & 0xffffff) / 16777215.0; }
+inline double rnd(int x, int y, uint32_t seed) {
+  return (hash2(x, y, seed) & 0xffffff) / 16777215.0;
+}
 
 // Smooth value noise, 0..1, period-free.
 inline double valueNoise(double x, double y, uint32_t seed) {
@@ -42,7 +44,9 @@ inline double fractal(double x, double y, uint32_t seed, int octaves = 4) {
 struct Col {
   double r, g, b;
 };
-inline Col mix(Col a, Col b, double t) { return {a.r + (b.r - a.r) * t, a.g + (b.g - a.g) * t, a.b + (b.b - a.b) * t}; }
+inline Col mix(Col a, Col b, double t) {
+  return {a.r + (b.r - a.r) * t, a.g + (b.g - a.g) * t, a.b + (b.b - a.b) * t};
+}
 inline double sstep(double e0, double e1, double x) {
   double t = std::clamp((x - e0) / (e1 - e0), 0.0, 1.0);
   return t * t * (3 - 2 * t);
@@ -91,7 +95,8 @@ inline std::vector<uint8_t> makePhoto(int w, int h) {
         c = Col{0.72, 0.16, 0.12};
         if (u > hx + 0.05 && u < hx + 0.1 && v > hy + 0.03 && v < hy + 0.07) c = Col{0.95, 0.95, 0.9};
       }
-      if (v <= hy && v > hy - 0.08 && std::fabs(u - (hx + 0.08)) < (v - (hy - 0.08)) * 1.1) c = Col{0.35, 0.2, 0.16};
+      if (v <= hy && v > hy - 0.08 && std::fabs(u - (hx + 0.08)) < (v - (hy - 0.08)) * 1.1)
+        c = Col{0.35, 0.2, 0.16};
       // A face: skin, hair, eyes, mouth.
       const double fxc = 0.22 * w / s, fyc = 0.68;
       const double ex = (u - fxc) / 0.085, ey = (v - fyc) / 0.16;

@@ -218,7 +218,7 @@ bool writeJpeg(const std::string& path, const Image& img, int quality, int orien
   jpeg_set_defaults(&cinfo);
   jpeg_set_quality(&cinfo, quality, TRUE);
   jpeg_start_compress(&cinfo, TRUE);
-  if (orientation > 1) {
+  if (orientation >= 1) {
     // APP1 "Exif": little-endian TIFF header, IFD0 with the one Orientation entry.
     const uint8_t exif[] = {'E',  'x',  'i', 'f', 0, 0, 'I', 'I', 42,
                             0,    8,    0,   0,   0,  // header, IFD0 at 8

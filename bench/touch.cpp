@@ -18,6 +18,7 @@
 #include <cstdlib>
 #include <vector>
 
+#include "app-assist/WWindowController.h"
 #include "codec/Bitmap.h"
 #include "common/CLyUtil.h"
 #include "control/CLyFocusBox.h"
@@ -82,9 +83,13 @@ int main(int argc, char** argv) {
 
   // Six photos, layout 0 of six (handlers on its inner dividers).
   const int photos = 6, layout = 0;
-  Evas_Object* win = elm_win_add(nullptr, "bench-touch", ELM_WIN_BASIC);
+  auto* window = new app_assist::WWindowController("bench-touch");
+  if (!window->create()) {
+    std::fprintf(stderr, "bench_touch: no window\n");
+    return 1;
+  }
+  Evas_Object* win = window->getEvasObj();
   evas_object_resize(win, kWidth, kHeight);
-  evas_object_show(win);
   auto* list = new CLyMultiGridDrawRectList;
   auto* items = new CLyMultiGridSrcItemList;
   for (int i = 0; i < photos; ++i) {

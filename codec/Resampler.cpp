@@ -9,6 +9,11 @@
 
 namespace BitmapFactory {
 
+namespace {
+constexpr int kWeightBits = 14;
+constexpr int kOne = 1 << kWeightBits;
+}  // namespace
+
 Resampler::Resampler(int inWidth, int inHeight, int outWidth, int outHeight, uint8_t* out, bool bottomUp)
     : mInW(inWidth), mInH(inHeight), mOutW(outWidth), mOutH(outHeight), mOut(out), mBottomUp(bottomUp) {
   mCopy = (inWidth == outWidth && inHeight == outHeight);
@@ -16,20 +21,21 @@ Resampler::Resampler(int inWidth, int inHeight, int outWidth, int outHeight, uin
   try {
     buildTaps(mHTaps, mInW, mOutW);
     buildTaps(mVTaps, mInH, mOutH);
+    const size_t rowLen = static_cast<size_t>(mOutW) * 4;
     // Shrinking sums every source row into the (at most two) output rows it
     // covers; enlarging keeps the last few source rows.
     mShrinkV = mInH > mOutH;
-    mRing = mShrinkV ? 3 : mVTaps.maxCount + 1;
-    mRows.assign(static_cast<size_t>(mRing) * mOutW * 4, 0.0f);
+    mRing = mShrinkV ? 1 : mVTaps.maxCount + 1;
+    mRows.assign(static_cast<size_t>(mRing) * rowLen, 0);
+    mAcc.assign(2 * rowLen, 0);
   } catch (const std::bad_alloc&) {
     IVLOG_E("no memory for %d x %d -> %d x %d", inWidth, inHeight, outWidth, outHeight);
     mOk = false;
   }
 }
 
-// For every output index the span of source indexes it reads and their
-// weights. Shrinking: the share of each source pixel in the output pixel's
-// area. Enlarging: linear interpolation between the two nearest centres.
+// Shrinking: each source pixel weighs its share of the output pixel's area.
+// Enlarging: linear interpolation between the two nearest centres.
 void Resampler::buildTaps(Taps& taps, int in, int out) {
   taps.start.resize(out);
   taps.count.resize(out);
@@ -37,94 +43,97 @@ void Resampler::buildTaps(Taps& taps, int in, int out) {
   taps.weight.clear();
   taps.maxCount = 0;
   const double scale = static_cast<double>(in) / out;
+  std::vector<double> w;
   for (int i = 0; i < out; ++i) {
-    taps.offset[i] = static_cast<int>(taps.weight.size());
+    w.clear();
+    int first;
     if (in > out) {
       const double lo = i * scale;
       const double hi = std::min(static_cast<double>(in), (i + 1) * scale);
-      int first = static_cast<int>(std::floor(lo));
+      first = static_cast<int>(std::floor(lo));
       int last = std::min(in - 1, static_cast<int>(std::ceil(hi)) - 1);
       if (last < first) last = first;
-      taps.start[i] = first;
-      taps.count[i] = last - first + 1;
-      for (int j = first; j <= last; ++j) {
-        const double cover = std::min(hi, j + 1.0) - std::max(lo, static_cast<double>(j));
-        taps.weight.push_back(static_cast<float>(std::max(0.0, cover) / scale));
-      }
+      for (int j = first; j <= last; ++j)
+        w.push_back(std::max(0.0, std::min(hi, j + 1.0) - std::max(lo, static_cast<double>(j))) / scale);
     } else {
       double src = (i + 0.5) * scale - 0.5;
       src = std::max(0.0, std::min(static_cast<double>(in - 1), src));
-      int j0 = static_cast<int>(std::floor(src));
-      const double frac = src - j0;
-      if (j0 + 1 < in && frac > 1e-6) {
-        taps.start[i] = j0;
-        taps.count[i] = 2;
-        taps.weight.push_back(static_cast<float>(1.0 - frac));
-        taps.weight.push_back(static_cast<float>(frac));
-      } else {
-        taps.start[i] = j0;
-        taps.count[i] = 1;
-        taps.weight.push_back(1.0f);
-      }
+      first = static_cast<int>(std::floor(src));
+      const double frac = src - first;
+      w.push_back(1.0 - frac);
+      if (first + 1 < in && frac > 1e-9) w.push_back(frac);
     }
+    // Fixed point, the rounding left over going to the largest weight so that
+    // a flat area stays exactly flat.
+    int sum = 0;
+    size_t largest = 0;
+    const size_t base = taps.weight.size();
+    for (size_t k = 0; k < w.size(); ++k) {
+      const int q = static_cast<int>(std::lround(w[k] * kOne));
+      taps.weight.push_back(static_cast<int16_t>(q));
+      sum += q;
+      if (w[k] > w[largest]) largest = k;
+    }
+    taps.weight[base + largest] = static_cast<int16_t>(taps.weight[base + largest] + (kOne - sum));
+    taps.start[i] = first;
+    taps.count[i] = static_cast<int>(w.size());
+    taps.offset[i] = static_cast<int>(base);
     taps.maxCount = std::max(taps.maxCount, taps.count[i]);
   }
 }
 
-void Resampler::horizontal(const uint8_t* row, float* dst) const {
-  for (int x = 0; x < mOutW; ++x) {
-    const float* w = &mHTaps.weight[mHTaps.offset[x]];
+void Resampler::horizontal(const uint8_t* row, uint16_t* dst) const {
+  const int16_t* weights = mHTaps.weight.data();
+  for (int x = 0; x < mOutW; ++x, dst += 4) {
+    const int16_t* w = weights + mHTaps.offset[x];
     const uint8_t* p = row + static_cast<size_t>(mHTaps.start[x]) * 4;
-    float b = 0, g = 0, r = 0, a = 0;
+    int32_t b = 0, g = 0, r = 0, a = 0;
     for (int k = 0, n = mHTaps.count[x]; k < n; ++k, p += 4) {
       b += w[k] * p[0];
       g += w[k] * p[1];
       r += w[k] * p[2];
       a += w[k] * p[3];
     }
-    dst[0] = b;
-    dst[1] = g;
-    dst[2] = r;
-    dst[3] = a;
-    dst += 4;
+    constexpr int kShift = kWeightBits - 8, kHalf = 1 << (kShift - 1);
+    dst[0] = static_cast<uint16_t>((b + kHalf) >> kShift);
+    dst[1] = static_cast<uint16_t>((g + kHalf) >> kShift);
+    dst[2] = static_cast<uint16_t>((r + kHalf) >> kShift);
+    dst[3] = static_cast<uint16_t>((a + kHalf) >> kShift);
   }
 }
 
 void Resampler::pushRow(const uint8_t* row) {
   if (!mOk || mPushed >= mInH) return;
+  const size_t rowLen = static_cast<size_t>(mOutW) * 4;
   if (mCopy) {
     const int y = mBottomUp ? mInH - 1 - mPushed : mPushed;
-    memcpy(mOut + static_cast<size_t>(y) * mOutW * 4, row, static_cast<size_t>(mOutW) * 4);
+    memcpy(mOut + static_cast<size_t>(y) * rowLen, row, rowLen);
     ++mPushed;
     return;
   }
   if (!mShrinkV) {
-    horizontal(row, &mRows[static_cast<size_t>(mPushed % mRing) * mOutW * 4]);
+    horizontal(row, &mRows[static_cast<size_t>(mPushed % mRing) * rowLen]);
     ++mPushed;
     emitReady();
     return;
   }
-  // Shrinking: slot 2 takes the resized row, slots 0 and 1 accumulate the
-  // output rows mEmitted and mEmitted + 1.
-  const size_t rowLen = static_cast<size_t>(mOutW) * 4;
-  float* h = &mRows[2 * rowLen];
+  // Shrinking: add the resized row into the output rows it covers.
+  uint16_t* h = mRows.data();
   horizontal(row, h);
   const int j = mPushed++;
-  const double scale = static_cast<double>(mInH) / mOutH;
   for (int slot = 0; slot < 2 && mEmitted + slot < mOutH; ++slot) {
     const int y = mEmitted + slot;
-    const double lo = y * scale, hi = std::min(static_cast<double>(mInH), (y + 1) * scale);
-    const double cover = std::min(hi, j + 1.0) - std::max(lo, static_cast<double>(j));
-    if (cover <= 0) continue;
-    const float w = static_cast<float>(cover / scale);
-    float* acc = &mRows[slot * rowLen];
+    const int k = j - mVTaps.start[y];
+    if (k < 0 || k >= mVTaps.count[y]) continue;
+    const int32_t w = mVTaps.weight[mVTaps.offset[y] + k];
+    int32_t* acc = &mAcc[slot * rowLen];
     for (size_t i = 0; i < rowLen; ++i) acc[i] += w * h[i];
   }
   while (mEmitted < mOutH && mVTaps.start[mEmitted] + mVTaps.count[mEmitted] <= mPushed) {
-    storeRow(mEmitted, &mRows[0]);
+    storeRow(mEmitted, mAcc.data());
     ++mEmitted;
-    std::copy(mRows.begin() + rowLen, mRows.begin() + 2 * rowLen, mRows.begin());
-    std::fill(mRows.begin() + rowLen, mRows.begin() + 2 * rowLen, 0.0f);
+    std::copy(mAcc.begin() + rowLen, mAcc.end(), mAcc.begin());
+    std::fill(mAcc.begin() + rowLen, mAcc.end(), 0);
   }
 }
 
@@ -136,29 +145,28 @@ void Resampler::emitReady() {
 }
 
 void Resampler::emitRow(int y) {
-  const float* w = &mVTaps.weight[mVTaps.offset[y]];
+  const int16_t* w = &mVTaps.weight[mVTaps.offset[y]];
   const int start = mVTaps.start[y];
-  const int n = mVTaps.count[y];
   const size_t rowLen = static_cast<size_t>(mOutW) * 4;
-  mAcc.assign(rowLen, 0.0f);
-  for (int k = 0; k < n; ++k) {
-    const float* s = &mRows[static_cast<size_t>((start + k) % mRing) * rowLen];
-    for (size_t i = 0; i < rowLen; ++i) mAcc[i] += w[k] * s[i];
+  std::fill(mAcc.begin(), mAcc.begin() + rowLen, 0);
+  int32_t* acc = mAcc.data();
+  for (int k = 0; k < mVTaps.count[y]; ++k) {
+    const uint16_t* s = &mRows[static_cast<size_t>((start + k) % mRing) * rowLen];
+    const int32_t wk = w[k];
+    for (size_t i = 0; i < rowLen; ++i) acc[i] += wk * s[i];
   }
-  storeRow(y, mAcc.data());
+  storeRow(y, acc);
 }
 
-void Resampler::storeRow(int y, const float* acc) {
+// Sums are levels x 256 x (1 << 14): back to bytes, colour never above alpha.
+void Resampler::storeRow(int y, const int32_t* acc) {
   const int outY = mBottomUp ? mOutH - 1 - y : y;
   uint8_t* dst = mOut + static_cast<size_t>(outY) * mOutW * 4;
   const size_t rowLen = static_cast<size_t>(mOutW) * 4;
+  constexpr int kShift = kWeightBits + 8, kHalf = 1 << (kShift - 1);
   for (size_t i = 0; i < rowLen; i += 4) {
-    int a = static_cast<int>(acc[i + 3] + 0.5f);
-    a = std::max(0, std::min(255, a));
-    for (int c = 0; c < 3; ++c) {
-      int v = static_cast<int>(acc[i + c] + 0.5f);
-      dst[i + c] = static_cast<uint8_t>(std::max(0, std::min(a, v)));  // premultiplied: colour <= alpha
-    }
+    const int a = std::min(255, std::max(0, (acc[i + 3] + kHalf) >> kShift));
+    for (int c = 0; c < 3; ++c) dst[i + c] = static_cast<uint8_t>(std::min(a, std::max(0, (acc[i + c] + kHalf) >> kShift)));
     dst[i + 3] = static_cast<uint8_t>(a);
   }
 }

@@ -24,18 +24,21 @@ class Resampler {
   int rowsPushed() const { return mPushed; }
 
  private:
+  // For every output index: the first source index it reads, how many, and
+  // their weights (fixed point, summing to 1 << 14) from `offset`.
   struct Taps {
     std::vector<int> start;
     std::vector<int> count;
-    std::vector<float> weight;  // count[i] weights per output index, from offset[i]
     std::vector<int> offset;
+    std::vector<int16_t> weight;
     int maxCount = 0;
   };
   static void buildTaps(Taps& taps, int in, int out);
-  void horizontal(const uint8_t* row, float* dst) const;
+  // One source row resized to the output width, in 1/256 steps of a level.
+  void horizontal(const uint8_t* row, uint16_t* dst) const;
   void emitReady();
   void emitRow(int y);
-  void storeRow(int y, const float* acc);
+  void storeRow(int y, const int32_t* acc);
 
   int mInW, mInH, mOutW, mOutH;
   uint8_t* mOut;
@@ -44,11 +47,11 @@ class Resampler {
   bool mCopy = false;     // same size: rows are copied straight through
   bool mShrinkV = false;  // fewer output rows than source rows
   Taps mHTaps, mVTaps;
-  int mRing = 0;             // rows of horizontally resized source kept
-  std::vector<float> mRows;  // mRing x outWidth x 4
-  std::vector<float> mAcc;   // one output row being summed
-  int mPushed = 0;           // source rows fed so far
-  int mEmitted = 0;          // output rows written so far
+  int mRing = 0;                // resized source rows kept when enlarging
+  std::vector<uint16_t> mRows;  // mRing rows of outWidth x 4
+  std::vector<int32_t> mAcc;    // shrinking: sums of output rows mEmitted and mEmitted + 1
+  int mPushed = 0;              // source rows fed so far
+  int mEmitted = 0;             // output rows written so far
 };
 
 }  // namespace BitmapFactory

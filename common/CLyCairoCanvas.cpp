@@ -2,7 +2,9 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdint>
 #include <cstdlib>
+#include <vector>
 
 #include "codec/Bitmap.h"
 #include "common/CLyLog.h"
@@ -29,6 +31,63 @@ namespace {
 
 inline void setColor(cairo_t* cr, const CLyFloatRectangle& c) {
   cairo_set_source_rgba(cr, c.x1, c.y1, c.x2, c.y2);
+}
+
+// The part (x, y, w, h) of an ARGB32 image surface averaged over k x k
+// boxes (partial boxes at the right and bottom edges average what they
+// cover). Null when the part is empty or memory runs out.
+cairo_surface_t* boxReduce(cairo_surface_t* surface, int x, int y, int w, int h, int k) {
+  cairo_surface_flush(surface);
+  const int sw = cairo_image_surface_get_width(surface), sh = cairo_image_surface_get_height(surface);
+  const int x0 = std::max(0, x), y0 = std::max(0, y);
+  const int x1 = std::min(sw, x + w), y1 = std::min(sh, y + h);
+  if (x1 <= x0 || y1 <= y0 || k < 2) return nullptr;
+  const int n = x1 - x0;
+  const int ow = (n + k - 1) / k, oh = (y1 - y0 + k - 1) / k;
+  cairo_surface_t* out = cairo_image_surface_create(CAIRO_FORMAT_ARGB32, ow, oh);
+  if (cairo_surface_status(out) != CAIRO_STATUS_SUCCESS) {
+    cairo_surface_destroy(out);
+    return nullptr;
+  }
+  const unsigned char* src = cairo_image_surface_get_data(surface);
+  const int sstride = cairo_image_surface_get_stride(surface);
+  unsigned char* dst = cairo_image_surface_get_data(out);
+  const int dstride = cairo_image_surface_get_stride(out);
+  std::vector<uint32_t> acc((size_t)ow * 4);
+  for (int oy = 0; oy < oh; oy++) {
+    std::fill(acc.begin(), acc.end(), 0u);
+    const int ry0 = y0 + oy * k, ry1 = std::min(y1, ry0 + k);
+    for (int ry = ry0; ry < ry1; ry++) {
+      const uint32_t* row = reinterpret_cast<const uint32_t*>(src + (size_t)ry * sstride) + x0;
+      uint32_t* a = acc.data();
+      int rx = 0;
+      for (int ox = 0; ox < ow; ox++, a += 4) {
+        const int end = std::min(n, rx + k);
+        uint32_t b = 0, g = 0, r = 0, al = 0;
+        for (; rx < end; rx++) {
+          const uint32_t p = row[rx];
+          b += p & 0xFF;
+          g += (p >> 8) & 0xFF;
+          r += (p >> 16) & 0xFF;
+          al += p >> 24;
+        }
+        a[0] += b;
+        a[1] += g;
+        a[2] += r;
+        a[3] += al;
+      }
+    }
+    const uint32_t rows = (uint32_t)(ry1 - ry0);
+    uint32_t* o = reinterpret_cast<uint32_t*>(dst + (size_t)oy * dstride);
+    const uint32_t* a = acc.data();
+    for (int ox = 0; ox < ow; ox++, a += 4) {
+      const uint32_t count = rows * (uint32_t)std::min(k, n - ox * k), half = count / 2;
+      o[ox] = ((a[3] + half) / count) << 24 | ((a[2] + half) / count) << 16 | ((a[1] + half) / count) << 8 |
+              ((a[0] + half) / count);
+    }
+  }
+  cairo_surface_mark_dirty(out);
+  return out;
 }
 
 }  // namespace
@@ -431,9 +490,26 @@ void CLyCairoCanvas::drawBitmap(cairo_surface_t* surface, const CLyFloatRectangl
     cairo_new_path(mContext);
     return;
   }
+  const double sx = src.w / (double)dst.x2, sy = src.h / (double)dst.y2;
+  const int k = mSmoothDownscale ? (int)std::floor(std::min(sx, sy)) : 1;
+  if (k >= 2 && cairo_surface_get_type(surface) == CAIRO_SURFACE_TYPE_IMAGE &&
+      cairo_image_surface_get_format(surface) == CAIRO_FORMAT_ARGB32) {
+    // Reduced pixel p stands for the source pixels max(0, src) + p k onwards.
+    cairo_surface_t* reduced = boxReduce(surface, src.x, src.y, src.w, src.h, k);
+    if (reduced) {
+      const int x0 = std::max(0, src.x), y0 = std::max(0, src.y);
+      cairo_matrix_t m;
+      cairo_matrix_init_translate(&m, (src.x - x0) / (double)k, (src.y - y0) / (double)k);
+      cairo_matrix_scale(&m, sx / k, sy / k);
+      cairo_matrix_translate(&m, -(dst.x1 - mGeometry.x), -(dst.y1 - mGeometry.y));
+      _setSourcePattern(reduced, m);
+      cairo_surface_destroy(reduced);
+      return;
+    }
+  }
   cairo_matrix_t m;
   cairo_matrix_init_translate(&m, src.x, src.y);
-  cairo_matrix_scale(&m, src.w / (double)dst.x2, src.h / (double)dst.y2);
+  cairo_matrix_scale(&m, sx, sy);
   cairo_matrix_translate(&m, -(dst.x1 - mGeometry.x), -(dst.y1 - mGeometry.y));
   _setSourcePattern(surface, m);
 }

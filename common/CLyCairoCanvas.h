@@ -43,6 +43,12 @@ class CLyCairoCanvas {
   // which averages all covered pixels when a large crop shrinks into a cell.
   void setFilter(cairo_filter_t filter) { mFilter = filter; }
   cairo_filter_t getFilter() const { return mFilter; }
+  // When a bitmap shrinks by a factor k >= 2, first average it over k x k
+  // boxes, then filter the rest (under 2x) bilinearly: every source pixel
+  // counts, so a large crop reduced into a small cell does not alias. Used by
+  // the save pass; far cheaper than cairo's GOOD filter, which convolves.
+  void setSmoothDownscale(bool smooth) { mSmoothDownscale = smooth; }
+  bool getSmoothDownscale() const { return mSmoothDownscale; }
 
   void clear();
   void clearRect(const CLyFloatRectangle& rect);
@@ -90,4 +96,5 @@ class CLyCairoCanvas {
   _CLyCairoCanvasGl* mGl = nullptr;  // GL device, evas GL, config, surface, context (GL mode only)
   CLyRectangle mGeometry{0, 0, 0, 0};
   cairo_filter_t mFilter = CAIRO_FILTER_BILINEAR;
+  bool mSmoothDownscale = false;
 };

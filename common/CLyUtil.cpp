@@ -3,6 +3,7 @@
 #include <Ecore_File.h>
 #include <Eina.h>
 #include <libexif/exif-data.h>
+#include <libexif/exif-loader.h>
 #include <libintl.h>
 #include <sys/stat.h>
 
@@ -69,6 +70,29 @@ bool addExtra(app_control_h request, const char* key, const char* value) {
     return false;
   }
   return true;
+}
+
+// The EXIF data of a file as it is stored. Loading through
+// exif_data_new_from_file would "fix" the data to the standard first, which
+// drops an orientation kept only in IFD 1 (and invents entries that are not
+// in the file). nullptr when the file has no EXIF data.
+ExifData* loadExif(const char* path) {
+  ExifLoader* loader = exif_loader_new();
+  if (!loader) return nullptr;
+  exif_loader_write_file(loader, path);
+  const unsigned char* buffer = nullptr;
+  unsigned int size = 0;
+  exif_loader_get_buf(loader, &buffer, &size);
+  ExifData* data = nullptr;
+  if (buffer && size > 0) {
+    data = exif_data_new();
+    if (data) {
+      exif_data_unset_option(data, EXIF_DATA_OPTION_FOLLOW_SPECIFICATION);
+      exif_data_load_data(data, buffer, size);
+    }
+  }
+  exif_loader_unref(loader);
+  return data;
 }
 
 }  // namespace
@@ -226,7 +250,7 @@ void CLyUtil::replyToLaunchRequest(app_control_h request, int result) {
 
 int CLyUtil::getOrientation(const std::string& path) {
   if (path.empty()) return -1;
-  ExifData* data = exif_data_new_from_file(path.c_str());
+  ExifData* data = loadExif(path.c_str());
   if (!data) {
     LYLOG_E("exif_data_new failed");
     return -1;

@@ -6,6 +6,13 @@
 
 #include "common/CLyLog.h"
 
+namespace {
+// The gesture layer reads the target's events at a late priority of its
+// own; releases must reach the collage after it, presses before it.
+const short kBeforeLayer = EVAS_CALLBACK_PRIORITY_BEFORE * 10;
+const short kAfterLayer = EVAS_CALLBACK_PRIORITY_AFTER * 10;
+}  // namespace
+
 struct _CLyGestureImpl {
   CLyGesture* owner = nullptr;
   Evas_Object* layer = nullptr;
@@ -242,17 +249,17 @@ void CLyGesture::__attach() {
   Evas_Object* t = _pImpl->target;
   using I = _CLyGestureImpl;
   // Presses and moves first, releases last: see the header.
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, I::onMouseDown,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_DOWN, kBeforeLayer, I::onMouseDown,
                                           _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_MOVE, EVAS_CALLBACK_PRIORITY_BEFORE, I::onMouseMove,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_MOVE, kBeforeLayer, I::onMouseMove,
                                           _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, I::onMultiDown,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_DOWN, kBeforeLayer, I::onMultiDown,
                                           _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_MOVE, EVAS_CALLBACK_PRIORITY_BEFORE, I::onMultiMove,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_MOVE, kBeforeLayer, I::onMultiMove,
                                           _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_UP, EVAS_CALLBACK_PRIORITY_AFTER, I::onMouseUp,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_UP, kAfterLayer, I::onMouseUp,
                                           _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_UP, EVAS_CALLBACK_PRIORITY_AFTER, I::onMultiUp,
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_UP, kAfterLayer, I::onMultiUp,
                                           _pImpl);
   elm_gesture_layer_attach(_pImpl->layer, t);
   _pImpl->attached = true;

@@ -168,12 +168,12 @@ class CLyMultiGrid : public CLyControl {
   void __postMouseDown(int index, bool placeholder);
   void __resetStatusAfterMouseUp(int x, int y);
   void __onTap(int type, int state, int x, int y);
-  void __tryClickHover(int x, int y);
+  void __tryClickHover(int x, int y, int pressed, int touched);
   void __notifyMainView();
   void __showFocusHandler();
   void __resizeFocusRect(const CLyPoint& delta, int dotIndex);
   int __tryUpdateCurrentIndex(int x, int y);
-  void __onMomentum(int state, int x, int y);
+  void __onMomentum(int state, int x, int y, int fingers);
   void __movePhoto(int x, int y);
   void __onZoom(int state, int x, int y, double zoom);
   void __pinchGridImage(float zoom);

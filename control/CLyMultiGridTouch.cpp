@@ -54,7 +54,11 @@ struct _CLyMultiGridTouchState {
   Elm_Transit* zoomInTransit = nullptr;
   Elm_Transit* moveBackTransit = nullptr;
   int doubleTapIndex = -1;
-  bool pressEffectReleased = false;  // the last release effect ran for the press now ending
+  // The gesture layer reports a tap only once the double-tap time has passed,
+  // after the release reset the press: the release keeps what the tap needs.
+  bool tapPending = false;
+  int tapPressedIndex = -1;
+  int tapTouchedIndex = -1;
 };
 
 namespace {
@@ -261,7 +265,7 @@ void CLyMultiGrid::__processGestureEvent(int type, int state, void* info) {
       __onLongTap(state, gi->x, gi->y);
       break;
     case LY_GESTURE_MOMENTUM:
-      __onMomentum(state, gi->x, gi->y);
+      __onMomentum(state, gi->x, gi->y, gi->fingers);
       break;
     case LY_GESTURE_ZOOM:
       __onZoom(state, gi->x, gi->y, gi->zoom);
@@ -304,6 +308,7 @@ void CLyMultiGrid::__onMouseDown(int x, int y) {
     LYLOG_D("Invalid mode[%d]", _pImpl->mode);
     return;
   }
+  if (_CLyMultiGridTouchState* ts = touchState(_pImpl)) ts->tapPending = false;
   _pImpl->pressedIndex = index;
   _pImpl->touchedIndex = index;
   _pImpl->mode = LY_MULTIGRID_MODE_PRESSED;
@@ -363,6 +368,14 @@ void CLyMultiGrid::__resetStatusAfterMouseUp(int x, int y) {
   }
   switch (_pImpl->mode) {
     case LY_MULTIGRID_MODE_PRESSED:
+      // A press released without panning may still become a tap.
+      if (_CLyMultiGridTouchState* ts = touchState(_pImpl)) {
+        ts->tapPending = true;
+        ts->tapPressedIndex = _pImpl->pressedIndex;
+        ts->tapTouchedIndex = _pImpl->touchedIndex;
+      }
+      _pImpl->mode = LY_MULTIGRID_MODE_IDLE;
+      break;
     case LY_MULTIGRID_MODE_PANNING:
       _pImpl->mode = LY_MULTIGRID_MODE_IDLE;
       break;
@@ -379,29 +392,36 @@ void CLyMultiGrid::__resetStatusAfterMouseUp(int x, int y) {
 // ---------------------------------------------------------------- taps and selection
 
 void CLyMultiGrid::__onTap(int type, int state, int x, int y) {
-  if (_pImpl->mode != LY_MULTIGRID_MODE_PRESSED) {
+  _CLyMultiGridTouchState* ts = touchState(_pImpl);
+  const bool released = ts && ts->tapPending && _pImpl->mode == LY_MULTIGRID_MODE_IDLE;
+  if (_pImpl->mode != LY_MULTIGRID_MODE_PRESSED && !released) {
     LYLOG_D("View is not in DOWN/SELECT_DOWN mode[%d]", _pImpl->mode);
     return;
   }
-  if (_pImpl->touchedIndex < 0) {
+  const int touched = released ? ts->tapTouchedIndex : _pImpl->touchedIndex;
+  const int pressed = released ? ts->tapPressedIndex : _pImpl->pressedIndex;
+  if (touched < 0) {
     LYLOG_D("No Mouse Down Event");
     return;
   }
-  _CLyMultiGridTouchState* ts = touchState(_pImpl);
-  if (type == LY_GESTURE_DOUBLE_TAP && state == LY_GESTURE_STATE_START && ts) ts->doubleTapIndex = _pImpl->touchedIndex;
-  if (state != LY_GESTURE_STATE_END) return;
+  if (type == LY_GESTURE_DOUBLE_TAP && state == LY_GESTURE_STATE_START && ts) ts->doubleTapIndex = touched;
+  if (state != LY_GESTURE_STATE_END) {
+    if (state == LY_GESTURE_STATE_ABORT && released && type == LY_GESTURE_TAP) ts->tapPending = false;
+    return;
+  }
+  if (released) ts->tapPending = false;
   if (type == LY_GESTURE_TAP) CLyUtil::playTouchSound();
   const int index = __getClickIndex(x, y);
-  if (index != _pImpl->touchedIndex) return;
+  if (index != touched) return;
   LYLOG_D("Same index");
   if (index != _pImpl->currentIndex)
-    __tryClickHover(x, y);
+    __tryClickHover(x, y, pressed, touched);
   else
     LYLOG_D("Clicked index: %d", index);
 }
 
-void CLyMultiGrid::__tryClickHover(int x, int y) {
-  if (_pImpl->pressedIndex == _pImpl->touchedIndex && __isValidItemIndex(_pImpl->touchedIndex)) {
+void CLyMultiGrid::__tryClickHover(int x, int y, int pressed, int touched) {
+  if (pressed == touched && __isValidItemIndex(touched)) {
     if (!_pImpl->controlObj) return;
     WTimer::addJob(
         [this, x, y](void*) {
@@ -539,12 +559,19 @@ int CLyMultiGrid::__tryUpdateCurrentIndex(int x, int y) {
   return 2;
 }
 
-void CLyMultiGrid::__onMomentum(int state, int x, int y) {
+void CLyMultiGrid::__onMomentum(int state, int x, int y, int fingers) {
   const int mode = _pImpl->mode;
   if (mode != LY_MULTIGRID_MODE_PRESSED && mode != LY_MULTIGRID_MODE_PANNING && mode != LY_MULTIGRID_MODE_DRAGGING) {
     LYLOG_D("View is not in MOVE/DRAG mode[%d]", mode);
     if (_pImpl->singleImageMode && mode == LY_MULTIGRID_MODE_IDLE && !__isPlaceholder(__getClickIndex(x, y)))
       __runReleaseEffect();
+    return;
+  }
+  // Two fingers pinch; they never pan (the pan of one cell would follow the
+  // point between the fingers, which may lie on another cell).
+  if ((fingers > 1 || _pImpl->fingerCount > 1) &&
+      (state == LY_GESTURE_STATE_START || state == LY_GESTURE_STATE_MOVE) && mode != LY_MULTIGRID_MODE_DRAGGING) {
+    LYLOG_D("Pinch, no move");
     return;
   }
   switch (state) {

@@ -41,7 +41,8 @@ int IEL_resize_image(IeImageInfo* src, IeImageInfo* dst) {
   }
   LYLOG_D("IEL_resize_image ret_val is %d %d %d  %d", src->width, src->height, dst->width, dst->height);
   if (src->width <= 0 || src->height <= 0 || dst->width <= 0 || dst->height <= 0) {
-    LYLOG_E("IEL_resize_image: invalid size %dx%d -> %dx%d", src->width, src->height, dst->width, dst->height);
+    LYLOG_E("IEL_resize_image: invalid size %dx%d -> %dx%d", src->width, src->height, dst->width,
+            dst->height);
     return IE_ERROR_INVALID_SIZE;
   }
   const std::vector<Sample> xs = sampleTable(dst->width, src->width);
@@ -92,8 +93,8 @@ int IEL_Alpha_blending(IeImageInfo* src, IeImageInfo* dst, float alpha) {
   return IE_ERROR_NONE;
 }
 
-void IEL_Percent_blending(const unsigned char* first, const unsigned char* second, unsigned char* out, int width,
-                          int height, int percent) {
+void IEL_Percent_blending(const unsigned char* first, const unsigned char* second, unsigned char* out,
+                          int width, int height, int percent) {
   if (!first || !second || !out || width <= 0 || height <= 0) {
     LYLOG_E("IEL_Percent_blending: invalid buffers or size %dx%d", width, height);
     return;

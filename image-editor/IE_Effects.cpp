@@ -26,7 +26,9 @@ const IeEffect kEffects[] = {
 
 }  // namespace
 
-int IE_Engine_Effect_Count() { return (int)(sizeof(kEffects) / sizeof(kEffects[0])); }
+int IE_Engine_Effect_Count() {
+  return (int)(sizeof(kEffects) / sizeof(kEffects[0]));
+}
 
 const IeEffect* IE_Engine_Effect_Get(int order) {
   return order >= 0 && order < IE_Engine_Effect_Count() ? &kEffects[order] : nullptr;

@@ -13,7 +13,9 @@ const int16_t kFilterCodes[37] = {203, 410, 204, 205, 202, 206, 213, 201, 211, 2
                                   215, 218, 217, 216, 417, 418, 419, 420, 421, 422, 423};
 constexpr int16_t kCodeAbove = 400;
 
-size_t pixelCount(const IeImageInfo* image) { return (size_t)image->width * (size_t)image->height; }
+size_t pixelCount(const IeImageInfo* image) {
+  return (size_t)image->width * (size_t)image->height;
+}
 
 // Fills a new surface with the source; the surface keeps the source's byte
 // order ("BA24" for format 8, "AR24" for format 9).
@@ -28,7 +30,8 @@ tbm_surface_h makeSourceSurface(const IeImageInfo* src) {
   }
   const size_t rowBytes = (size_t)src->width * 4;
   for (int y = 0; y < src->height; ++y)
-    memcpy(info.planes[0].ptr + (size_t)y * info.planes[0].stride, src->pbBuf + (size_t)y * rowBytes, rowBytes);
+    memcpy(info.planes[0].ptr + (size_t)y * info.planes[0].stride, src->pbBuf + (size_t)y * rowBytes,
+           rowBytes);
   tbm_surface_unmap(surface);
   return surface;
 }
@@ -81,8 +84,8 @@ int runOnBuffers(const IeImageInfo* src, IeImageInfo* dst, int code) {
   }
   image_filter_h filter = nullptr;
   bool ok = image_filter_create(&filter, IMAGE_FILTER_MODE_BUFFER) == IMAGE_FILTER_ERROR_NONE;
-  ok = ok && image_filter_set_input_by_buffer(filter, input, src->width, src->height, IMAGE_FILTER_FORMAT_BGRA) ==
-                 IMAGE_FILTER_ERROR_NONE;
+  ok = ok && image_filter_set_input_by_buffer(filter, input, src->width, src->height,
+                                              IMAGE_FILTER_FORMAT_BGRA) == IMAGE_FILTER_ERROR_NONE;
   ok = ok && image_filter_set_output_by_buffer(filter, dst->pbBuf) == IMAGE_FILTER_ERROR_NONE;
   ok = ok && image_filter_set_filter(filter, code) == IMAGE_FILTER_ERROR_NONE;
   ok = ok && image_filter_apply(filter) == IMAGE_FILTER_ERROR_NONE;
@@ -127,7 +130,8 @@ int IE_Engine_Apply_Effect(IeImageInfo* src, IeImageInfo* dst, int effectNumber)
   if (effectNumber < 0) LYLOG_W("negative effect number %d uses filter code %d", effectNumber, kCodeAbove);
   const int code = IE_Engine_Filter_Code(effectNumber);
   // Codes 201..600 run on tbm surfaces, the others on plain buffers.
-  const int result = code >= 201 && code <= 600 ? runOnSurfaces(src, dst, code) : runOnBuffers(src, dst, code);
+  const int result =
+      code >= 201 && code <= 600 ? runOnSurfaces(src, dst, code) : runOnBuffers(src, dst, code);
   if (result != IE_ERROR_NONE) {
     LYLOG_E("filter %d failed on %dx%d", code, src->width, src->height);
     return result;

@@ -50,5 +50,5 @@ int IEL_Alpha_blending(IeImageInfo* src, IeImageInfo* dst, float alpha);
 // out = second x (255 - a) + first x a, >> 8, with a = percent% of 255, over
 // the first three bytes of each pixel; the fourth byte of out is not written.
 // out may be first (or second). A percent outside 0..100 is clamped.
-void IEL_Percent_blending(const unsigned char* first, const unsigned char* second, unsigned char* out, int width,
-                          int height, int percent);
+void IEL_Percent_blending(const unsigned char* first, const unsigned char* second, unsigned char* out,
+                          int width, int height, int percent);

@@ -36,8 +36,8 @@ CLyAppControlLauncher::~CLyAppControlLauncher() {
   delete _pv;
 }
 
-bool CLyAppControlLauncher::sendLaunchRequest(app_control_h request, app_control_reply_cb reply, void* userData,
-                                              Evas_Object* freezeObj, double freezeSeconds) {
+bool CLyAppControlLauncher::sendLaunchRequest(app_control_h request, app_control_reply_cb reply,
+                                              void* userData, Evas_Object* freezeObj, double freezeSeconds) {
   _clearAll();
   if (!request) {
     LYLOG_E("Invalid request");
@@ -48,7 +48,9 @@ bool CLyAppControlLauncher::sendLaunchRequest(app_control_h request, app_control
     _pv->frozenObj = app_assist::wevasobject_get_weak_ptr(freezeObj);
     evas_object_freeze_events_set(freezeObj, EINA_TRUE);
     _pv->freezeTimer = ecore_timer_add(freezeSeconds, __onFreezeTimer, this);
-    evas_object_event_callback_add(freezeObj, EVAS_CALLBACK_DEL, __onFrozenObjDel, this);
+    // Evas holds back every callback of an object whose events are frozen,
+    // its DEL callback included; the object-level deletion event still comes.
+    efl_event_callback_add(freezeObj, EFL_EVENT_DEL, __onFrozenObjDel, this);
   }
   int ret = app_control_send_launch_request(request, reply, userData);
   if (ret != APP_CONTROL_ERROR_NONE) {
@@ -70,15 +72,19 @@ void CLyAppControlLauncher::_clearAll() {
   _releaseFreeze();
 }
 
-bool CLyAppControlLauncher::hasCurrentRequest() const { return _pv->request != nullptr; }
+bool CLyAppControlLauncher::hasCurrentRequest() const {
+  return _pv->request != nullptr;
+}
 
-bool CLyAppControlLauncher::isFreezing() const { return _pv->freezeTimer != nullptr || !_pv->frozenObj.expired(); }
+bool CLyAppControlLauncher::isFreezing() const {
+  return _pv->freezeTimer != nullptr || !_pv->frozenObj.expired();
+}
 
 void CLyAppControlLauncher::_releaseFreeze() {
   if (auto frozen = _pv->frozenObj.lock()) {
     Evas_Object* obj = frozen->getEvasObj();
     evas_object_freeze_events_set(obj, EINA_FALSE);
-    evas_object_event_callback_del_full(obj, EVAS_CALLBACK_DEL, __onFrozenObjDel, this);
+    efl_event_callback_del(obj, EFL_EVENT_DEL, __onFrozenObjDel, this);
   }
   _pv->frozenObj.reset();
   if (_pv->freezeTimer) {
@@ -95,7 +101,7 @@ Eina_Bool CLyAppControlLauncher::__onFreezeTimer(void* data) {
   return ECORE_CALLBACK_CANCEL;
 }
 
-void CLyAppControlLauncher::__onFrozenObjDel(void* data, Evas*, Evas_Object*, void*) {
+void CLyAppControlLauncher::__onFrozenObjDel(void* data, const Efl_Event*) {
   auto* self = static_cast<CLyAppControlLauncher*>(data);
   // The object is going: nothing to unfreeze on it; the timer goes too.
   self->_pv->frozenObj.reset();

@@ -19,8 +19,8 @@ class CLyAppControlLauncher {
 
   // Takes ownership of `request` in every case. `freezeObj` (may be null)
   // ignores input for `freezeSeconds` or until it is deleted.
-  bool sendLaunchRequest(app_control_h request, app_control_reply_cb reply, void* userData, Evas_Object* freezeObj,
-                         double freezeSeconds);
+  bool sendLaunchRequest(app_control_h request, app_control_reply_cb reply, void* userData,
+                         Evas_Object* freezeObj, double freezeSeconds);
   // Terminates the current request's application and lifts any freeze.
   void _clearAll();
 
@@ -35,7 +35,7 @@ class CLyAppControlLauncher {
 
   void _releaseFreeze();
   static Eina_Bool __onFreezeTimer(void* data);
-  static void __onFrozenObjDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onFrozenObjDel(void* data, const Efl_Event* event);
 
   _CLyAppControlLauncherImpl* _pv;
 };

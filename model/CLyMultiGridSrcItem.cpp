@@ -102,11 +102,14 @@ CLyRectangle* CLyMultiGridSrcItem::checkRectInOrg(CLyRectangle* rect) const {
   const int64_t W = _pv->width, H = _pv->height;
   int64_t l = rect->x, t = rect->y, r = rect->w, b = rect->h;
   const int64_t entryW = r - l, entryH = b - t;
-  if (r > W && entryW > 0) {
+  // A crop larger than the bitmap shrinks to fit, keeping its shape. (Only
+  // a larger one: a crop that merely overhangs an edge is moved back below,
+  // not blown up to the bitmap's width, which would jump the zoom.)
+  if (r > W && entryW > W) {
     r = l + W;
     b = t + entryH * W / entryW;
   }
-  if (b > H && entryH > 0) {
+  if (b > H && b - t > H && entryH > 0) {
     r = l + entryW * H / entryH;
     b = t + H;
   }

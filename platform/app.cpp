@@ -124,8 +124,10 @@ void watchExistingWindows() {
   void* item;
   EINA_LIST_FREE(list, item) {
     auto* ee = static_cast<Ecore_Evas*>(item);
+    // Elementary keeps each window's object on its canvas; skip windows
+    // that are being deleted.
     auto* win = static_cast<Evas_Object*>(ecore_evas_data_get(ee, "elm_win"));
-    if (win) ui_app_watch_window(win);
+    if (win && !efl_invalidated_get(win) && elm_win_get(win) == win) ui_app_watch_window(win);
   }
 }
 

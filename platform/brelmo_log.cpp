@@ -30,7 +30,9 @@ const char* const kSchema =
     "  value TEXT,"
     "  time INTEGER NOT NULL);";
 
-std::string dbPath() { return platform_db::storePath("PICTAVO_USAGE_LOG_DB", "usage_log.db"); }
+std::string dbPath() {
+  return platform_db::storePath("PICTAVO_USAGE_LOG_DB", "usage_log.db");
+}
 
 char* dupColumn(sqlite3_stmt* stmt, int column) {
   const unsigned char* text = sqlite3_column_text(stmt, column);
@@ -67,7 +69,8 @@ extern "C" int brelmo_log_manager_destroy(brelmo_log_manager_h handle) {
 
 extern "C" int brelmo_log_manager_insert(brelmo_log_manager_h handle, const char* uri, bundle* data,
                                          brelmo_log_insert_cb callback, void* user_data) {
-  if (!handle || !uri || !data || strncmp(uri, "content://", 10) != 0) return BRELMO_LOG_ERROR_INVALID_PARAMETER;
+  if (!handle || !uri || !data || strncmp(uri, "content://", 10) != 0)
+    return BRELMO_LOG_ERROR_INVALID_PARAMETER;
   const char* appId = bundleValue(data, "app_id");
   const char* feature = bundleValue(data, "feature");
   if (!appId || !feature) return BRELMO_LOG_ERROR_INVALID_PARAMETER;
@@ -109,8 +112,9 @@ extern "C" int brelmo_log_list(brelmo_log_record_s** records, size_t* count) {
   if (!db) return BRELMO_LOG_ERROR_DB_FAILED;
   sqlite3_stmt* stmt = nullptr;
   std::vector<brelmo_log_record_s> found;
-  int rc = sqlite3_prepare_v2(db, "SELECT id, uri, app_id, feature, extra, value, time FROM usage_log ORDER BY id",
-                              -1, &stmt, nullptr);
+  int rc =
+      sqlite3_prepare_v2(db, "SELECT id, uri, app_id, feature, extra, value, time FROM usage_log ORDER BY id",
+                         -1, &stmt, nullptr);
   while (rc == SQLITE_OK || rc == SQLITE_ROW) {
     rc = sqlite3_step(stmt);
     if (rc != SQLITE_ROW) break;

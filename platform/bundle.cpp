@@ -9,7 +9,9 @@ struct _bundle_t {
   std::vector<std::pair<std::string, std::string>> pairs;
 };
 
-extern "C" bundle* bundle_create(void) { return new (std::nothrow) _bundle_t; }
+extern "C" bundle* bundle_create(void) {
+  return new (std::nothrow) _bundle_t;
+}
 
 extern "C" int bundle_free(bundle* b) {
   if (!b) return BUNDLE_ERROR_INVALID_PARAMETER;
@@ -42,7 +44,9 @@ extern "C" int bundle_get_str(bundle* b, const char* key, char** str) {
   return BUNDLE_ERROR_KEY_NOT_AVAILABLE;
 }
 
-extern "C" int bundle_get_count(bundle* b) { return b ? static_cast<int>(b->pairs.size()) : 0; }
+extern "C" int bundle_get_count(bundle* b) {
+  return b ? static_cast<int>(b->pairs.size()) : 0;
+}
 
 extern "C" void bundle_foreach_str(bundle* b, bundle_str_iterator_cb cb, void* user_data) {
   if (!b || !cb) return;

@@ -89,12 +89,21 @@ void onKeyDown(void*, Evas* evas, Evas_Object*, void* event_info) {
     dispatch(evas, EEXT_CALLBACK_MORE);
 }
 
-void onCatcherDel(void*, Evas* evas, Evas_Object*, void*) {
-  gCatchers.erase(evas);
+// The canvas is passed as data: while a canvas is torn down the callback's
+// own canvas argument cannot be relied on.
+void onCatcherDel(void* data, Evas*, Evas_Object* obj, void*) {
+  auto it = gCatchers.find(static_cast<Evas*>(data));
+  if (it != gCatchers.end() && it->second == obj) gCatchers.erase(it);
 }
 
 void ensureCatcher(Evas* evas) {
-  if (!evas || gCatchers.count(evas)) return;
+  if (!evas) return;
+  auto it = gCatchers.find(evas);
+  if (it != gCatchers.end()) {
+    // A new canvas may reuse the address of a freed one.
+    if (evas_object_evas_get(it->second) == evas) return;
+    gCatchers.erase(it);
+  }
   Evas_Object* catcher = evas_object_rectangle_add(evas);
   if (!catcher) {
     LYLOG_E("Cannot create the key catcher");
@@ -106,7 +115,7 @@ void ensureCatcher(Evas* evas) {
     for (size_t i = 0; i < 2; ++i)
       if (!evas_object_key_grab(catcher, keys[i], 0, 0, EINA_FALSE)) LYLOG_W("Cannot grab %s", keys[i]);
   evas_object_event_callback_add(catcher, EVAS_CALLBACK_KEY_DOWN, onKeyDown, nullptr);
-  evas_object_event_callback_add(catcher, EVAS_CALLBACK_DEL, onCatcherDel, nullptr);
+  evas_object_event_callback_add(catcher, EVAS_CALLBACK_DEL, onCatcherDel, evas);
   gCatchers[evas] = catcher;
 }
 

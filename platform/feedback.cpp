@@ -63,12 +63,17 @@ extern "C" int feedback_deinitialize(void) {
 
 extern "C" int feedback_play(feedback_pattern_e pattern) {
   if (gInitCount.load() <= 0) return FEEDBACK_ERROR_NOT_INITIALIZED;
-  if (pattern != FEEDBACK_PATTERN_TAP && pattern != FEEDBACK_PATTERN_SIP) return FEEDBACK_ERROR_INVALID_PARAMETER;
+  if (pattern != FEEDBACK_PATTERN_TAP && pattern != FEEDBACK_PATTERN_SIP)
+    return FEEDBACK_ERROR_INVALID_PARAMETER;
   gPlayCount.fetch_add(1);
   if (!playDesktopClick()) LYLOG_I("feedback: tap (pattern %d)", static_cast<int>(pattern));
   return FEEDBACK_ERROR_NONE;
 }
 
-extern "C" int feedback_get_play_count(void) { return gPlayCount.load(); }
+extern "C" int feedback_get_play_count(void) {
+  return gPlayCount.load();
+}
 
-extern "C" int feedback_is_initialized(void) { return gInitCount.load() > 0; }
+extern "C" int feedback_is_initialized(void) {
+  return gInitCount.load() > 0;
+}

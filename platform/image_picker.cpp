@@ -64,7 +64,9 @@ bool hasImageExtension(const char* path) {
   return ext == "jpg" || ext == "jpeg" || ext == "png" || ext == "gif" || ext == "bmp" || ext == "wbmp";
 }
 
-Eina_Bool imageFilter(const char* path, Eina_Bool dir, void*) { return dir || hasImageExtension(path); }
+Eina_Bool imageFilter(const char* path, Eina_Bool dir, void*) {
+  return dir || hasImageExtension(path);
+}
 
 std::string startFolder() {
   if (const char* dir = getenv("PICTAVO_PICKER_DIR"); dir && *dir) return dir;
@@ -79,7 +81,9 @@ std::string startFolder() {
   return home && *home ? home : "/";
 }
 
-void deleteWindowJob(void* data) { evas_object_del(static_cast<Evas_Object*>(data)); }
+void deleteWindowJob(void* data) {
+  evas_object_del(static_cast<Evas_Object*>(data));
+}
 
 // Ends the session: no more answers, the window goes (from the main loop, as
 // this may run inside one of the window's own callbacks).
@@ -176,7 +180,8 @@ void onSelected(void* data, Evas_Object*, void*) {
   auto* session = static_cast<PickerSession*>(data);
   if (!session->multiple) return;
   size_t count = eina_list_count(elm_fileselector_selected_paths_get(session->selector));
-  if (static_cast<int>(count) > session->maxCount) notification_status_message_post(maximumText(session->maxCount).c_str());
+  if (static_cast<int>(count) > session->maxCount)
+    notification_status_message_post(maximumText(session->maxCount).c_str());
 }
 
 void onDeleteRequest(void* data, Evas_Object*, void*) {
@@ -292,7 +297,8 @@ int image_picker_launch(app_control_h request, const std::shared_ptr<app_control
   app_control_get_launch_mode(request, &mode);
   if (!buildWindow(session, mode)) {
     LYLOG_E("Cannot open the picker window");
-    if (session->window) evas_object_del(session->window);  // frees the session
+    if (session->window)
+      evas_object_del(session->window);  // frees the session
     else {
       app_control_destroy(request);
       delete session;
@@ -310,9 +316,13 @@ int image_picker_launch(app_control_h request, const std::shared_ptr<app_control
   return APP_CONTROL_ERROR_NONE;
 }
 
-Evas_Object* image_picker_get_window(void) { return gOpen && !gOpen->finished ? gOpen->window : nullptr; }
+Evas_Object* image_picker_get_window(void) {
+  return gOpen && !gOpen->finished ? gOpen->window : nullptr;
+}
 
-Evas_Object* image_picker_get_fileselector(void) { return gOpen && !gOpen->finished ? gOpen->selector : nullptr; }
+Evas_Object* image_picker_get_fileselector(void) {
+  return gOpen && !gOpen->finished ? gOpen->selector : nullptr;
+}
 
 bool image_picker_submit(const std::vector<std::string>& paths) {
   if (!gOpen || gOpen->finished) return false;
@@ -325,4 +335,6 @@ bool image_picker_cancel(void) {
   return true;
 }
 
-int image_picker_get_open_count(void) { return gOpenCount; }
+int image_picker_get_open_count(void) {
+  return gOpenCount;
+}

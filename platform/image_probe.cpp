@@ -15,16 +15,22 @@ constexpr size_t kHeaderBytes = 64;
 // Limits reading a corrupt JPEG's chain of segments.
 constexpr int kMaxJpegSegments = 4096;
 
-uint32_t be16(const unsigned char* p) { return (p[0] << 8) | p[1]; }
+uint32_t be16(const unsigned char* p) {
+  return (p[0] << 8) | p[1];
+}
 uint32_t be32(const unsigned char* p) {
   return (uint32_t(p[0]) << 24) | (uint32_t(p[1]) << 16) | (uint32_t(p[2]) << 8) | p[3];
 }
-uint32_t le16(const unsigned char* p) { return p[0] | (p[1] << 8); }
+uint32_t le16(const unsigned char* p) {
+  return p[0] | (p[1] << 8);
+}
 int32_t le32(const unsigned char* p) {
   return int32_t(uint32_t(p[0]) | (uint32_t(p[1]) << 8) | (uint32_t(p[2]) << 16) | (uint32_t(p[3]) << 24));
 }
 
-bool validSize(int w, int h) { return w > 0 && h > 0 && w <= 1 << 20 && h <= 1 << 20; }
+bool validSize(int w, int h) {
+  return w > 0 && h > 0 && w <= 1 << 20 && h <= 1 << 20;
+}
 
 bool probeJpeg(FILE* f, ProbeResult& r) {
   if (fseek(f, 2, SEEK_SET) != 0) return false;

@@ -31,7 +31,9 @@ std::mutex gMutex;
 sqlite3* gDb = nullptr;
 int gConnections = 0;
 
-std::string dbPath() { return platform_db::storePath("PICTAVO_MEDIA_DB", "media.db"); }
+std::string dbPath() {
+  return platform_db::storePath("PICTAVO_MEDIA_DB", "media.db");
+}
 
 char* dupColumn(sqlite3_stmt* stmt, int column) {
   const unsigned char* text = sqlite3_column_text(stmt, column);

@@ -22,7 +22,9 @@ void onWindowDel(void*, Evas*, Evas_Object* obj, void*) {
   if (gWindow == obj) gWindow = nullptr;
 }
 
-void onToastTimeout(void*, Evas_Object* popup, void*) { evas_object_del(popup); }
+void onToastTimeout(void*, Evas_Object* popup, void*) {
+  evas_object_del(popup);
+}
 
 void showToast(Evas_Object* window, const char* message) {
   Evas_Object* popup = elm_popup_add(window);
@@ -50,7 +52,9 @@ extern "C" void notification_set_window(Evas_Object* window) {
   if (gWindow) evas_object_event_callback_add(gWindow, EVAS_CALLBACK_DEL, onWindowDel, nullptr);
 }
 
-extern "C" Evas_Object* notification_get_window(void) { return gWindow; }
+extern "C" Evas_Object* notification_get_window(void) {
+  return gWindow;
+}
 
 extern "C" int notification_status_message_post(const char* message) {
   if (!message) return NOTIFICATION_ERROR_INVALID_PARAMETER;

@@ -37,7 +37,8 @@ std::string picturesFromUserDirs() {
   while (std::getline(in, line)) {
     if (line.compare(0, key.size(), key) != 0) continue;
     std::string value = line.substr(key.size());
-    if (value.size() >= 2 && value.front() == '"' && value.back() == '"') value = value.substr(1, value.size() - 2);
+    if (value.size() >= 2 && value.front() == '"' && value.back() == '"')
+      value = value.substr(1, value.size() - 2);
     if (value.compare(0, 5, "$HOME") == 0) value = homeDir() + value.substr(5);
     if (!value.empty() && value[0] == '/') return value;
   }
@@ -104,7 +105,9 @@ extern "C" int storage_get_external_memory_size(struct statvfs* buf) {
   return STORAGE_ERROR_NONE;
 }
 
-extern "C" char* storage_get_internal_root(void) { return strdup(internalRoot().c_str()); }
+extern "C" char* storage_get_internal_root(void) {
+  return strdup(internalRoot().c_str());
+}
 
 extern "C" char* storage_get_external_root(void) {
   std::string root = externalRoot();

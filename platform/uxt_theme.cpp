@@ -94,7 +94,9 @@ struct ParseState {
 
 std::string tagName(const char* content, unsigned length) {
   unsigned n = 0;
-  while (n < length && !isspace(static_cast<unsigned char>(content[n])) && content[n] != '/' && content[n] != '>') ++n;
+  while (n < length && !isspace(static_cast<unsigned char>(content[n])) && content[n] != '/' &&
+         content[n] != '>')
+    ++n;
   return std::string(content, n);
 }
 
@@ -138,7 +140,8 @@ void addColor(ParseState& state, const Attributes& attributes) {
 void addFont(ParseState& state, const Attributes& attributes) {
   auto code = attributes.find("code");
   auto family = attributes.find("family");
-  if (code == attributes.end() || code->second.empty() || family == attributes.end() || family->second.empty()) {
+  if (code == attributes.end() || code->second.empty() || family == attributes.end() ||
+      family->second.empty()) {
     LYLOG_E("%s: font entry without a code or a family", state.file);
     return;
   }
@@ -187,8 +190,8 @@ bool parseTable(const char* file, ParseState& state) {
     return false;
   }
   state.file = file;
-  Eina_Bool ok = eina_simple_xml_parse(content.c_str(), static_cast<unsigned>(content.size()), EINA_TRUE, onXml,
-                                       &state);
+  Eina_Bool ok =
+      eina_simple_xml_parse(content.c_str(), static_cast<unsigned>(content.size()), EINA_TRUE, onXml, &state);
   if (!ok || state.broken) {
     LYLOG_E("Theme table %s is not well formed", file);
     return false;
@@ -322,8 +325,8 @@ extern "C" int uxt_theme_set_changeable_ui_enabled(bool enabled) {
 }
 
 extern "C" int uxt_theme_get_color(const char* code, int* r, int* g, int* b, int* a, int* outline_r,
-                                   int* outline_g, int* outline_b, int* outline_a, int* shadow_r, int* shadow_g,
-                                   int* shadow_b, int* shadow_a) {
+                                   int* outline_g, int* outline_b, int* outline_a, int* shadow_r,
+                                   int* shadow_g, int* shadow_b, int* shadow_a) {
   if (!code) return UXT_THEME_ERROR_INVALID_PARAMETER;
   std::lock_guard<std::mutex> lock(gMutex);
   const ColorEntry* entry = findColor(code);
@@ -386,7 +389,8 @@ extern "C" int uxt_theme_object_replace_color(Evas_Object* obj, const char* from
     edje = elm_layout_edje_get(obj);
   }
   if (!edje) return UXT_THEME_ERROR_NOT_SUPPORTED;
-  edje_object_color_class_set(edje, from_code, c.main.r, c.main.g, c.main.b, c.main.a, c.outline.r, c.outline.g,
-                              c.outline.b, c.outline.a, c.shadow.r, c.shadow.g, c.shadow.b, c.shadow.a);
+  edje_object_color_class_set(edje, from_code, c.main.r, c.main.g, c.main.b, c.main.a, c.outline.r,
+                              c.outline.g, c.outline.b, c.outline.a, c.shadow.r, c.shadow.g, c.shadow.b,
+                              c.shadow.a);
   return UXT_THEME_ERROR_NONE;
 }

@@ -75,10 +75,12 @@ LAYOUTS = {
              handlers=[['R', 'B'], ['L', 'B'], ['R', 'T'], ['L', 'R', 'T'], ['L', 'T']], rule='Grid5Style1'),
         dict(cells=[[0, 0, T23, T3], [T23, 0, 1, T23], [0, T3, T3, 1], [T3, T23, 1, 1], [T3, T3, T23, T23]],
              handlers=[['R', 'B'], ['L', 'B'], ['R', 'T'], ['L', 'T'], ['BR', 'BL', 'TR', 'TL']],
-             rule='Grid5Style2'),
+             rule='Grid5Style2',
+             note='A pinwheel around the centre cell 4. Its corner handlers pair the dividers as the rule dispatches them: h0 and h2 move the right divider (image 1), h1 and h3 the left one (image 3); h0 and h1 the lower divider (image 2), h2 and h3 the upper one (image 1).'),
         dict(cells=[[0, 0, 1, T3], [0, T3, T3, T23], [T3, T3, T23, T23], [T23, T3, 1, T23], [0, T23, 1, 1]],
              handlers=[['B'], ['T', 'B', 'R'], ['TL', 'TR', 'BL', 'BR'], ['T', 'B', 'L'], ['T']],
-             rule='Grid5Style3'),
+             rule='Grid5Style3',
+             note='Cell 2 sits in the middle of the middle row; its corners h0 (TL) and h2 (BL) move the left divider, h1 and h3 the right one; h0 and h1 the upper line, h2 and h3 the lower one. Cells 1 and 3 list their top handler first (upper line for h0, lower line otherwise).'),
         row_layout(5, 'X', 'Grid5Style4'),
         dict(cells=[[0, 0, T3, H], [T3, 0, T23, H], [T23, 0, 1, H], [0, H, H, 1], [H, H, 1, 1]],
              handlers=[['R', 'B'], ['L', 'R', 'B'], ['L', 'B'], ['R', 'T'], ['L', 'T']], rule='Grid5Style5'),
@@ -104,7 +106,8 @@ LAYOUTS = {
         dict(cells=[[0, 0, 1, T3], [0, T3, Q, T23], [Q, T3, H, T23], [H, T3, 3 * Q, T23], [3 * Q, T3, 1, T23],
                     [0, T23, 1, 1]],
              handlers=[['B'], ['T', 'R', 'B'], ['L', 'T', 'R', 'B'], ['L', 'T', 'R', 'B'], ['TL', 'B'], ['T']],
-             row=('X', [1, 2, 3, 4]), rule='Grid6Style4'),
+             row=('X', [1, 2, 3, 4]), rule='Grid6Style4',
+             note='The middle row follows the row rule: for cells 2..4 h0 is the leading (left) divider, any other handler of cells 1..3 the trailing one. Cell 4 therefore carries its left divider and the upper line in one corner handler (h0, TL); the vertical dispatch sends h0 (and h1 of cells 2, 3) to the upper line and the rest to the lower one.'),
         dict(cells=[[0, 0, T3, T3], [0, T3, T3, T23], [0, T23, T3, 1], [T3, 0, 1, T23], [T3, T23, T23, 1],
                     [T23, T23, 1, 1]],
              handlers=[['R', 'B'], ['T', 'B', 'R'], ['R', 'T'], ['L', 'B'], ['L', 'R', 'T'], ['L', 'T']],
@@ -253,6 +256,8 @@ def main():
             for c in range(count):
                 hs = ', '.join(f'h{i} {k}' for i, k in enumerate(layout['handlers'][c])) or 'none'
                 doc.append(f'- cell {c}: {hs}')
+            if 'note' in layout:
+                doc += ['', layout['note']]
             doc.append('')
         with open(f'res/styles/grid/styleimage{count}.json', 'w') as fp:
             json.dump(out, fp, indent=1)

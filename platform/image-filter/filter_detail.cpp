@@ -24,22 +24,24 @@ void lookSharpen(const Frame& f) {
     int d = std::abs(i) <= kThreshold ? 0 : (i > 0 ? i - kThreshold : i + kThreshold);
     boost[i + 255] = (int8_t)std::clamp((d * kAmount) >> 8, -kCap, kCap);
   }
-  const Channels c = f.ch;
-  for (int y = 0; y < f.height; ++y) {
-    const uint8_t* s = f.srcRow(y);
-    uint8_t* d = f.dstRow(y);
-    const uint8_t* l = luma.row(y);
-    const uint8_t* b = blur.row(y);
-    for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-      const int k = boost[l[x] - b[x] + 255];
-      const int r = s[c.r], g = s[c.g], bl = s[c.b];
-      const uint8_t a = s[c.a];
-      d[c.r] = (uint8_t)clamp255(r + k);
-      d[c.g] = (uint8_t)clamp255(g + k);
-      d[c.b] = (uint8_t)clamp255(bl + k);
-      d[c.a] = a;
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = f.dstRow(y);
+      const uint8_t* l = luma.row(y);
+      const uint8_t* b = blur.row(y);
+      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
+        const int k = boost[l[x] - b[x] + 255];
+        const int r = s[c.r], g = s[c.g], bl = s[c.b];
+        const uint8_t a = s[c.a];
+        d[c.r] = (uint8_t)clamp255(r + k);
+        d[c.g] = (uint8_t)clamp255(g + k);
+        d[c.b] = (uint8_t)clamp255(bl + k);
+        d[c.a] = a;
+      }
     }
-  }
+  });
 }
 
 namespace {
@@ -57,16 +59,14 @@ void lumaOf(const Rgba& img, Gray& out) {
 // Edge strength 0..255 from the Sobel magnitude, ramped between two levels.
 void edgesOf(const Gray& l, Gray& out, int low, int high) {
   out.resize(l.w, l.h);
-  auto at = [&l](int x, int y) -> int {
-    return l.row(std::clamp(y, 0, l.h - 1))[std::clamp(x, 0, l.w - 1)];
-  };
+  auto at = [&l](int x, int y) -> int { return l.row(std::clamp(y, 0, l.h - 1))[std::clamp(x, 0, l.w - 1)]; };
   for (int y = 0; y < l.h; ++y) {
     uint8_t* d = out.row(y);
     for (int x = 0; x < l.w; ++x) {
-      const int gx = at(x + 1, y - 1) + 2 * at(x + 1, y) + at(x + 1, y + 1) - at(x - 1, y - 1) - 2 * at(x - 1, y) -
-                     at(x - 1, y + 1);
-      const int gy = at(x - 1, y + 1) + 2 * at(x, y + 1) + at(x + 1, y + 1) - at(x - 1, y - 1) - 2 * at(x, y - 1) -
-                     at(x + 1, y - 1);
+      const int gx = at(x + 1, y - 1) + 2 * at(x + 1, y) + at(x + 1, y + 1) - at(x - 1, y - 1) -
+                     2 * at(x - 1, y) - at(x - 1, y + 1);
+      const int gy = at(x - 1, y + 1) + 2 * at(x, y + 1) + at(x + 1, y + 1) - at(x - 1, y - 1) -
+                     2 * at(x, y - 1) - at(x + 1, y - 1);
       const int mag = std::abs(gx) + std::abs(gy);
       d[x] = (uint8_t)clamp255((mag - low) * 255 / (high - low));
     }
@@ -102,30 +102,32 @@ void lookCartoon(const Frame& f) {
   }
   Upsampler<4> upColour(smooth, factor, f.width, f.height);
   Upsampler<1> upEdges(edges, factor, f.width, f.height);
-  const Channels c = f.ch;
-  constexpr int kInk = 24;
-  for (int y = 0; y < f.height; ++y) {
-    const uint8_t* u = upColour.row(y);
-    const uint8_t* e = upEdges.row(y);
-    const uint8_t* s = f.srcRow(y);
-    uint8_t* d = f.dstRow(y);
-    for (int x = 0; x < f.width; ++x, u += 4, s += 4, d += 4) {
-      const int l = luma709(u[0], u[1], u[2]);
-      const int k = ratio[l];
-      int r = (u[0] * k) >> 8, g = (u[1] * k) >> 8, b = (u[2] * k) >> 8;
-      // A little more colour, as in a drawing.
-      const int nl = (r + g + b) / 3;
-      r = clamp255(nl + (((r - nl) * 310) >> 8));
-      g = clamp255(nl + (((g - nl) * 310) >> 8));
-      b = clamp255(nl + (((b - nl) * 310) >> 8));
-      const int ink = e[x];
-      const uint8_t a = s[c.a];
-      d[c.r] = (uint8_t)((r * (255 - ink) + kInk * ink) / 255);
-      d[c.g] = (uint8_t)((g * (255 - ink) + kInk * ink) / 255);
-      d[c.b] = (uint8_t)((b * (255 - ink) + kInk * ink) / 255);
-      d[c.a] = a;
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    constexpr int kInk = 24;
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* u = upColour.row(y);
+      const uint8_t* e = upEdges.row(y);
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = f.dstRow(y);
+      for (int x = 0; x < f.width; ++x, u += 4, s += 4, d += 4) {
+        const int l = luma709(u[0], u[1], u[2]);
+        const int k = ratio[l];
+        int r = (u[0] * k) >> 8, g = (u[1] * k) >> 8, b = (u[2] * k) >> 8;
+        // A little more colour, as in a drawing.
+        const int nl = (r + g + b) / 3;
+        r = clamp255(nl + (((r - nl) * 310) >> 8));
+        g = clamp255(nl + (((g - nl) * 310) >> 8));
+        b = clamp255(nl + (((b - nl) * 310) >> 8));
+        const int ink = e[x];
+        const uint8_t a = s[c.a];
+        d[c.r] = (uint8_t)((r * (255 - ink) + kInk * ink) / 255);
+        d[c.g] = (uint8_t)((g * (255 - ink) + kInk * ink) / 255);
+        d[c.b] = (uint8_t)((b * (255 - ink) + kInk * ink) / 255);
+        d[c.a] = a;
+      }
     }
-  }
+  });
 }
 
 }  // namespace imgfilter

@@ -17,6 +17,21 @@ constexpr Channels kOrderARGB{1, 2, 3, 0};
 // Memory order B, G, R, A (tbm "AR24", the evas and cairo layout).
 constexpr Channels kOrderBGRA{2, 1, 0, 3};
 
+// Compile-time channel orders: kernels written as generic lambdas get
+// constant byte offsets through dispatchOrder, which lets the compiler merge
+// the byte loads and stores of a pixel.
+template <int R, int G, int B, int A>
+struct Order {
+  static constexpr Channels ch{R, G, B, A};
+};
+template <typename Fn>
+inline void dispatchOrder(const Channels& ch, Fn&& fn) {
+  if (ch.a == kOrderARGB.a)
+    fn(Order<1, 2, 3, 0>{});
+  else
+    fn(Order<2, 1, 0, 3>{});
+}
+
 // Source and destination share size and channel order; rows may be padded.
 // All reads of the source happen before, or at the same pixel as, the write
 // of the destination, so the two may be the same memory.
@@ -34,15 +49,21 @@ struct Frame {
   int shortSide() const { return width < height ? width : height; }
 };
 
-inline int clamp255(int v) { return v < 0 ? 0 : (v > 255 ? 255 : v); }
-inline double clamp01(double v) { return v < 0.0 ? 0.0 : (v > 1.0 ? 1.0 : v); }
+inline int clamp255(int v) {
+  return v < 0 ? 0 : (v > 255 ? 255 : v);
+}
+inline double clamp01(double v) {
+  return v < 0.0 ? 0.0 : (v > 1.0 ? 1.0 : v);
+}
 inline double smooth01(double t) {
   t = clamp01(t);
   return t * t * (3.0 - 2.0 * t);
 }
 
 // Rec. 709 luma in 8.8 fixed point (weights 54 + 183 + 19 = 256).
-inline int luma709(int r, int g, int b) { return (54 * r + 183 * g + 19 * b) >> 8; }
+inline int luma709(int r, int g, int b) {
+  return (54 * r + 183 * g + 19 * b) >> 8;
+}
 
 // Small, fast, seeded generator: every look that needs randomness seeds its
 // own, so results never depend on threads or on earlier calls.
@@ -84,12 +105,12 @@ struct WideLut {
   uint8_t v[768];
   template <typename F>
   void build(F&& f) {
-    for (int i = 0; i < 768; ++i) v[i] = (uint8_t)clamp255((int)std::lround(255.0 * clamp01(f(clamp01((i - 256) / 255.0)))));
+    for (int i = 0; i < 768; ++i)
+      v[i] = (uint8_t)clamp255((int)std::lround(255.0 * clamp01(f(clamp01((i - 256) / 255.0)))));
   }
-  uint8_t at(int value) const {
-    int i = value + 256;
-    return v[i < 0 ? 0 : (i > 767 ? 767 : i)];
-  }
+  // Callers keep values inside -256..511 (saturation at most 2), so the
+  // hot loops need no clamping.
+  uint8_t at(int value) const { return v[value + 256]; }
 };
 
 }  // namespace imgfilter

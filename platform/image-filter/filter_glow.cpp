@@ -27,41 +27,43 @@ void blurSource(const Frame& f, double sigmaFraction, Blurred& out) {
 }
 
 struct GlowBlend {
-  int soften = 0;              // 0..256: how much of the blur is mixed into the base
-  bool fromLuma = false;       // glow driven by the blur's luma instead of each channel
-  uint8_t glow[3][256] = {};   // glow amount per channel, screened over the base
+  int soften = 0;             // 0..256: how much of the blur is mixed into the base
+  bool fromLuma = false;      // glow driven by the blur's luma instead of each channel
+  uint8_t glow[3][256] = {};  // glow amount per channel, screened over the base
 };
 
 // Screens the enlarged blur over the destination, in place.
 void blendGlow(const Frame& f, const Blurred& b, const GlowBlend& gb) {
   Upsampler<4> up(b.small, b.factor, f.width, f.height);
-  const Channels c = f.ch;
-  const int soften = gb.soften;
-  for (int y = 0; y < f.height; ++y) {
-    const uint8_t* u = up.row(y);
-    uint8_t* d = f.dstRow(y);
-    for (int x = 0; x < f.width; ++x, u += 4, d += 4) {
-      const int br = u[0], bg = u[1], bb = u[2];
-      int r = d[c.r], g = d[c.g], bl = d[c.b];
-      r += ((br - r) * soften) >> 8;
-      g += ((bg - g) * soften) >> 8;
-      bl += ((bb - bl) * soften) >> 8;
-      int gr, gg, gbv;
-      if (gb.fromLuma) {
-        const int l = luma709(br, bg, bb);
-        gr = gb.glow[0][l];
-        gg = gb.glow[1][l];
-        gbv = gb.glow[2][l];
-      } else {
-        gr = gb.glow[0][br];
-        gg = gb.glow[1][bg];
-        gbv = gb.glow[2][bb];
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    const int soften = gb.soften;
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* u = up.row(y);
+      uint8_t* d = f.dstRow(y);
+      for (int x = 0; x < f.width; ++x, u += 4, d += 4) {
+        const int br = u[0], bg = u[1], bb = u[2];
+        int r = d[c.r], g = d[c.g], bl = d[c.b];
+        r += ((br - r) * soften) >> 8;
+        g += ((bg - g) * soften) >> 8;
+        bl += ((bb - bl) * soften) >> 8;
+        int gr, gg, gbv;
+        if (gb.fromLuma) {
+          const int l = luma709(br, bg, bb);
+          gr = gb.glow[0][l];
+          gg = gb.glow[1][l];
+          gbv = gb.glow[2][l];
+        } else {
+          gr = gb.glow[0][br];
+          gg = gb.glow[1][bg];
+          gbv = gb.glow[2][bb];
+        }
+        d[c.r] = (uint8_t)(r + ((gr * (255 - r) + 127) / 255));
+        d[c.g] = (uint8_t)(g + ((gg * (255 - g) + 127) / 255));
+        d[c.b] = (uint8_t)(bl + ((gbv * (255 - bl) + 127) / 255));
       }
-      d[c.r] = (uint8_t)(r + ((gr * (255 - r) + 127) / 255));
-      d[c.g] = (uint8_t)(g + ((gg * (255 - g) + 127) / 255));
-      d[c.b] = (uint8_t)(bl + ((gbv * (255 - bl) + 127) / 255));
     }
-  }
+  });
 }
 
 template <typename F>
@@ -69,7 +71,9 @@ void fillGlow(uint8_t (&lut)[256], F&& f) {
   for (int i = 0; i < 256; ++i) lut[i] = (uint8_t)clamp255((int)std::lround(255.0 * clamp01(f(i / 255.0))));
 }
 
-Frame inPlace(const Frame& f) { return Frame{f.dst, f.dstStride, f.dst, f.dstStride, f.width, f.height, f.ch}; }
+Frame inPlace(const Frame& f) {
+  return Frame{f.dst, f.dstStride, f.dst, f.dstStride, f.width, f.height, f.ch};
+}
 
 }  // namespace
 
@@ -78,19 +82,21 @@ void lookBlur(const Frame& f) {
   Blurred b;
   blurSource(f, 0.01, b);
   Upsampler<4> up(b.small, b.factor, f.width, f.height);
-  const Channels c = f.ch;
-  for (int y = 0; y < f.height; ++y) {
-    const uint8_t* u = up.row(y);
-    const uint8_t* s = f.srcRow(y);
-    uint8_t* d = f.dstRow(y);
-    for (int x = 0; x < f.width; ++x, u += 4, s += 4, d += 4) {
-      const uint8_t a = s[c.a];
-      d[c.r] = u[0];
-      d[c.g] = u[1];
-      d[c.b] = u[2];
-      d[c.a] = a;
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    for (int y = 0; y < f.height; ++y) {
+      const uint8_t* u = up.row(y);
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = f.dstRow(y);
+      for (int x = 0; x < f.width; ++x, u += 4, s += 4, d += 4) {
+        const uint8_t a = s[c.a];
+        d[c.r] = u[0];
+        d[c.g] = u[1];
+        d[c.b] = u[2];
+        d[c.a] = a;
+      }
     }
-  }
+  });
 }
 
 void lookSoftGlow(const Frame& f) {

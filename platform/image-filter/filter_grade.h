@@ -35,8 +35,8 @@ void applyGrade(const Frame& f, const Grade& g);
 
 struct Selective {
   enum Target { kGreens, kWarmHues } target = kGreens;
-  double satOther = 1.0;   // saturation of the other hues
-  double satTarget = 1.0;  // saturation of the target hue
+  double satOther = 1.0;      // saturation of the other hues
+  double satTarget = 1.0;     // saturation of the target hue
   double darkenTarget = 0.0;  // 0..1: the target hue gets darker by this at full weight
   WideLut lut[3];
   template <typename FR, typename FG, typename FB>
@@ -50,14 +50,22 @@ struct Selective {
 void applySelective(const Frame& f, const Selective& s);
 
 // Curve helpers on 0..1.
-inline double shadows(double t) { return (1.0 - t) * (1.0 - t); }
-inline double highlights(double t) { return t * t; }
-inline double mids(double t) { return 4.0 * t * (1.0 - t); }
+inline double shadows(double t) {
+  return (1.0 - t) * (1.0 - t);
+}
+inline double highlights(double t) {
+  return t * t;
+}
+inline double mids(double t) {
+  return 4.0 * t * (1.0 - t);
+}
 // k > 0 adds an S-curve (k = 1: smoothstep), k < 0 flattens towards mid grey.
 inline double contrast(double t, double k) {
   return k >= 0.0 ? t + k * (smooth01(t) - t) : 0.5 + (t - 0.5) * (1.0 + k);
 }
 // Maps 0..1 onto black..white (lifted blacks, dimmed whites).
-inline double range(double t, double black, double white) { return black + t * (white - black); }
+inline double range(double t, double black, double white) {
+  return black + t * (white - black);
+}
 
 }  // namespace imgfilter

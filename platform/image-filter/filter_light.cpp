@@ -33,7 +33,8 @@ class Canvas {
     addLight(mF.dstRow(y) + (size_t)x * 4, mF.ch, (int)(amount * 256.0), col);
   }
   int luma(int x, int y) const {
-    const uint8_t* p = mF.dstRow(std::clamp(y, 0, mF.height - 1)) + (size_t)std::clamp(x, 0, mF.width - 1) * 4;
+    const uint8_t* p =
+        mF.dstRow(std::clamp(y, 0, mF.height - 1)) + (size_t)std::clamp(x, 0, mF.width - 1) * 4;
     return luma709(p[mF.ch.r], p[mF.ch.g], p[mF.ch.b]);
   }
 
@@ -43,30 +44,32 @@ class Canvas {
 
 void drawSparkle(const Canvas& cv, int cx, int cy, double len, double intensity, const Rgb& col) {
   // Soft core.
-  const double sigma = std::max(0.7, len * 0.07);
+  const double sigma = std::max(0.5, len * 0.09);
   const int rc = (int)std::ceil(sigma * 2.5);
   for (int dy = -rc; dy <= rc; ++dy)
     for (int dx = -rc; dx <= rc; ++dx)
       cv.add(cx + dx, cy + dy, intensity * std::exp(-(dx * dx + dy * dy) / (2.0 * sigma * sigma)), col);
-  // Four long arms along the axes, four short faint ones on the diagonals.
+  // Four tapering arms along the axes; their width grows with their length,
+  // so a sparkle keeps its shape at any image size.
+  const double width = std::max(0.3, len * 0.05);
   const int n = (int)len;
-  const bool thick = len > 10.0;
   for (int t = 1; t <= n; ++t) {
-    const double fall = (1.0 - t / len) * (1.0 - t / len);
-    const double a = intensity * fall;
-    const int offs[4][2] = {{t, 0}, {-t, 0}, {0, t}, {0, -t}};
-    for (const auto& o : offs) {
-      cv.add(cx + o[0], cy + o[1], a, col);
-      if (thick && t < n / 2) {
-        const double side = a * 0.3 * (1.0 - 2.0 * t / len);
-        cv.add(cx + o[0] + (o[1] != 0), cy + o[1] + (o[0] != 0), side, col);
-        cv.add(cx + o[0] - (o[1] != 0), cy + o[1] - (o[0] != 0), side, col);
-      }
+    const double k = 1.0 - t / len;
+    const double a = intensity * k * k;
+    const double w = width * k + 0.3;
+    const int rw = (int)std::ceil(w * 2.0);
+    for (int o = -rw; o <= rw; ++o) {
+      const double v = a * std::exp(-(o * o) / (2.0 * w * w));
+      cv.add(cx + t, cy + o, v, col);
+      cv.add(cx - t, cy + o, v, col);
+      cv.add(cx + o, cy + t, v, col);
+      cv.add(cx + o, cy - t, v, col);
     }
   }
-  const int nd = (int)(len * 0.3);
-  for (int t = 1; t <= nd; ++t) {
-    const double a = 0.45 * intensity * (1.0 - t / (len * 0.3));
+  // Four short, faint diagonal rays.
+  const double dlen = len * 0.3;
+  for (int t = 1; t <= (int)dlen; ++t) {
+    const double a = 0.45 * intensity * (1.0 - t / dlen);
     cv.add(cx + t, cy + t, a, col);
     cv.add(cx - t, cy + t, a, col);
     cv.add(cx + t, cy - t, a, col);
@@ -90,9 +93,10 @@ void lookStardust(const Frame& f) {
                  tint = rng.uniform();
     const int x = std::min(f.width - 1, (int)(u * f.width));
     const int y = std::min(f.height - 1, (int)(v * f.height));
-    const int l = (cv.luma(x - 1, y) + cv.luma(x + 1, y) + cv.luma(x, y - 1) + cv.luma(x, y + 1) + cv.luma(x, y)) / 5;
-    const double bright = clamp01((l - 110) / 145.0);
-    if (pick > 0.04 + 0.55 * bright * bright) continue;
+    const int l =
+        (cv.luma(x - 1, y) + cv.luma(x + 1, y) + cv.luma(x, y - 1) + cv.luma(x, y + 1) + cv.luma(x, y)) / 5;
+    const double bright = clamp01((l - 100) / 155.0);
+    if (pick > 0.012 + 0.6 * bright * std::sqrt(bright)) continue;
     const double len = std::max(2.0, s * (0.006 + 0.028 * size * size * size));
     const Rgb col = tint < 0.6 ? Rgb{255, 255, 255} : (tint < 0.82 ? Rgb{255, 236, 186} : Rgb{205, 226, 255});
     drawSparkle(cv, x, y, len, 0.6 + 0.4 * size, col);
@@ -122,45 +126,49 @@ void lookLightFlare(const Frame& f) {
   }
   std::vector<int64_t> dx2((size_t)f.width);
   for (int x = 0; x < f.width; ++x) dx2[(size_t)x] = (int64_t)std::llround((x - sx) * (x - sx));
-  const Channels c = f.ch;
-  const uint8_t *g0 = glow[0].data(), *g1 = glow[1].data(), *g2 = glow[2].data();
-  for (int y = 0; y < f.height; ++y) {
-    const int64_t dy2 = (int64_t)std::llround((y - sy) * (y - sy));
-    const uint8_t* s = f.srcRow(y);
-    uint8_t* d = f.dstRow(y);
-    for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-      const size_t i = (size_t)std::min<int64_t>(4095, (dy2 + dx2[(size_t)x]) >> shift);
-      const int r = s[c.r], g = s[c.g], b = s[c.b];
-      const uint8_t a = s[c.a];
-      d[c.r] = (uint8_t)(r + (g0[i] * (255 - r) + 127) / 255);
-      d[c.g] = (uint8_t)(g + (g1[i] * (255 - g) + 127) / 255);
-      d[c.b] = (uint8_t)(b + (g2[i] * (255 - b) + 127) / 255);
-      d[c.a] = a;
-    }
-  }
-  // Ghosts: position along the axis, radius (of the short side), colour, strength.
-  struct Ghost {
-    double t, radius;
-    Rgb col;
-    double alpha;
-  };
-  const Ghost ghosts[] = {{0.72, 0.035, {190, 255, 205}, 0.2},  {1.05, 0.09, {255, 205, 150}, 0.1},
-                          {1.32, 0.05, {175, 205, 255}, 0.17},  {1.62, 0.14, {255, 175, 225}, 0.08},
-                          {1.88, 0.06, {255, 240, 175}, 0.15}};
-  const Canvas cv(f);
-  const double cx = W / 2.0, cy = H / 2.0, s = f.shortSide();
-  for (const Ghost& gh : ghosts) {
-    const double gx = sx + gh.t * (cx - sx), gy = sy + gh.t * (cy - sy), r = std::max(1.5, gh.radius * s);
-    const int x0 = (int)std::floor(gx - r), x1 = (int)std::ceil(gx + r);
-    const int y0 = (int)std::floor(gy - r), y1 = (int)std::ceil(gy + r);
-    for (int y = std::max(0, y0); y <= std::min(f.height - 1, y1); ++y)
-      for (int x = std::max(0, x0); x <= std::min(f.width - 1, x1); ++x) {
-        const double q = std::sqrt((x - gx) * (x - gx) + (y - gy) * (y - gy)) / r;
-        if (q >= 1.0) continue;
-        // Brighter towards the rim, soft at the edge.
-        cv.add(x, y, gh.alpha * (0.6 + 0.4 * q * q) * smooth01((1.0 - q) / 0.15), gh.col);
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    const uint8_t *g0 = glow[0].data(), *g1 = glow[1].data(), *g2 = glow[2].data();
+    for (int y = 0; y < f.height; ++y) {
+      const int64_t dy2 = (int64_t)std::llround((y - sy) * (y - sy));
+      const uint8_t* s = f.srcRow(y);
+      uint8_t* d = f.dstRow(y);
+      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
+        const size_t i = (size_t)std::min<int64_t>(4095, (dy2 + dx2[(size_t)x]) >> shift);
+        const int r = s[c.r], g = s[c.g], b = s[c.b];
+        const uint8_t a = s[c.a];
+        d[c.r] = (uint8_t)(r + (g0[i] * (255 - r) + 127) / 255);
+        d[c.g] = (uint8_t)(g + (g1[i] * (255 - g) + 127) / 255);
+        d[c.b] = (uint8_t)(b + (g2[i] * (255 - b) + 127) / 255);
+        d[c.a] = a;
       }
-  }
+    }
+    // Ghosts: position along the axis, radius (of the short side), colour, strength.
+    struct Ghost {
+      double t, radius;
+      Rgb col;
+      double alpha;
+    };
+    const Ghost ghosts[] = {{0.72, 0.035, {190, 255, 205}, 0.2},
+                            {1.05, 0.09, {255, 205, 150}, 0.1},
+                            {1.32, 0.05, {175, 205, 255}, 0.17},
+                            {1.62, 0.14, {255, 175, 225}, 0.08},
+                            {1.88, 0.06, {255, 240, 175}, 0.15}};
+    const Canvas cv(f);
+    const double cx = W / 2.0, cy = H / 2.0, s = f.shortSide();
+    for (const Ghost& gh : ghosts) {
+      const double gx = sx + gh.t * (cx - sx), gy = sy + gh.t * (cy - sy), r = std::max(1.5, gh.radius * s);
+      const int x0 = (int)std::floor(gx - r), x1 = (int)std::ceil(gx + r);
+      const int y0 = (int)std::floor(gy - r), y1 = (int)std::ceil(gy + r);
+      for (int y = std::max(0, y0); y <= std::min(f.height - 1, y1); ++y)
+        for (int x = std::max(0, x0); x <= std::min(f.width - 1, x1); ++x) {
+          const double q = std::sqrt((x - gx) * (x - gx) + (y - gy) * (y - gy)) / r;
+          if (q >= 1.0) continue;
+          // Brighter towards the rim, soft at the edge.
+          cv.add(x, y, gh.alpha * (0.6 + 0.4 * q * q) * smooth01((1.0 - q) / 0.15), gh.col);
+        }
+    }
+  });
 }
 
 }  // namespace imgfilter

@@ -20,80 +20,85 @@ int boxRadiusForSigma(double sigma) {
 void downscale(const Frame& f, int factor, Rgba& out) {
   const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
   out.resize(sw, sh);
-  const Channels c = f.ch;
-  if (factor == 1) {
-    for (int y = 0; y < f.height; ++y) {
-      const uint8_t* s = f.srcRow(y);
-      uint8_t* d = out.row(y);
-      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-        d[0] = s[c.r];
-        d[1] = s[c.g];
-        d[2] = s[c.b];
-        d[3] = s[c.a];
-      }
-    }
-    return;
-  }
-  std::vector<uint32_t> acc((size_t)sw * 4);
-  for (int by = 0; by < sh; ++by) {
-    std::fill(acc.begin(), acc.end(), 0u);
-    const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
-    for (int y = y0; y < y1; ++y) {
-      const uint8_t* s = f.srcRow(y);
-      for (int bx = 0; bx < sw; ++bx) {
-        const int x1 = std::min(f.width, (bx + 1) * factor);
-        uint32_t r = 0, g = 0, b = 0, a = 0;
-        for (int x = bx * factor; x < x1; ++x) {
-          const uint8_t* p = s + (size_t)x * 4;
-          r += p[c.r];
-          g += p[c.g];
-          b += p[c.b];
-          a += p[c.a];
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    if (factor == 1) {
+      for (int y = 0; y < f.height; ++y) {
+        const uint8_t* s = f.srcRow(y);
+        uint8_t* d = out.row(y);
+        for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
+          d[0] = s[c.r];
+          d[1] = s[c.g];
+          d[2] = s[c.b];
+          d[3] = s[c.a];
         }
-        uint32_t* q = &acc[(size_t)bx * 4];
-        q[0] += r;
-        q[1] += g;
-        q[2] += b;
-        q[3] += a;
+      }
+      return;
+    }
+    std::vector<uint32_t> acc((size_t)sw * 4);
+    for (int by = 0; by < sh; ++by) {
+      std::fill(acc.begin(), acc.end(), 0u);
+      const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
+      for (int y = y0; y < y1; ++y) {
+        const uint8_t* s = f.srcRow(y);
+        for (int bx = 0; bx < sw; ++bx) {
+          const int x1 = std::min(f.width, (bx + 1) * factor);
+          uint32_t r = 0, g = 0, b = 0, a = 0;
+          for (int x = bx * factor; x < x1; ++x) {
+            const uint8_t* p = s + (size_t)x * 4;
+            r += p[c.r];
+            g += p[c.g];
+            b += p[c.b];
+            a += p[c.a];
+          }
+          uint32_t* q = &acc[(size_t)bx * 4];
+          q[0] += r;
+          q[1] += g;
+          q[2] += b;
+          q[3] += a;
+        }
+      }
+      uint8_t* d = out.row(by);
+      const int rows = y1 - y0;
+      for (int bx = 0; bx < sw; ++bx) {
+        const int cols = std::min(f.width, (bx + 1) * factor) - bx * factor;
+        const uint32_t n = (uint32_t)(rows * cols);
+        for (int k = 0; k < 4; ++k) d[bx * 4 + k] = (uint8_t)((acc[(size_t)bx * 4 + k] + n / 2) / n);
       }
     }
-    uint8_t* d = out.row(by);
-    const int rows = y1 - y0;
-    for (int bx = 0; bx < sw; ++bx) {
-      const int cols = std::min(f.width, (bx + 1) * factor) - bx * factor;
-      const uint32_t n = (uint32_t)(rows * cols);
-      for (int k = 0; k < 4; ++k) d[bx * 4 + k] = (uint8_t)((acc[(size_t)bx * 4 + k] + n / 2) / n);
-    }
-  }
+  });
 }
 
 void downscaleLuma(const Frame& f, int factor, Gray& out) {
   const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
   out.resize(sw, sh);
-  const Channels c = f.ch;
-  if (factor == 1) {
-    for (int y = 0; y < f.height; ++y) {
-      const uint8_t* s = f.srcRow(y);
-      uint8_t* d = out.row(y);
-      for (int x = 0; x < f.width; ++x, s += 4) d[x] = (uint8_t)luma709(s[c.r], s[c.g], s[c.b]);
+  dispatchOrder(f.ch, [&](auto order) {
+    constexpr Channels c = decltype(order)::ch;
+    if (factor == 1) {
+      for (int y = 0; y < f.height; ++y) {
+        const uint8_t* s = f.srcRow(y);
+        uint8_t* d = out.row(y);
+        for (int x = 0; x < f.width; ++x, s += 4) d[x] = (uint8_t)luma709(s[c.r], s[c.g], s[c.b]);
+      }
+      return;
     }
-    return;
-  }
-  std::vector<uint32_t> acc((size_t)sw);
-  for (int by = 0; by < sh; ++by) {
-    std::fill(acc.begin(), acc.end(), 0u);
-    const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
-    for (int y = y0; y < y1; ++y) {
-      const uint8_t* s = f.srcRow(y);
-      for (int x = 0; x < f.width; ++x, s += 4) acc[(size_t)(x / factor)] += (uint32_t)luma709(s[c.r], s[c.g], s[c.b]);
+    std::vector<uint32_t> acc((size_t)sw);
+    for (int by = 0; by < sh; ++by) {
+      std::fill(acc.begin(), acc.end(), 0u);
+      const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
+      for (int y = y0; y < y1; ++y) {
+        const uint8_t* s = f.srcRow(y);
+        for (int x = 0; x < f.width; ++x, s += 4)
+          acc[(size_t)(x / factor)] += (uint32_t)luma709(s[c.r], s[c.g], s[c.b]);
+      }
+      uint8_t* d = out.row(by);
+      const int rows = y1 - y0;
+      for (int bx = 0; bx < sw; ++bx) {
+        const uint32_t n = (uint32_t)(rows * (std::min(f.width, (bx + 1) * factor) - bx * factor));
+        d[bx] = (uint8_t)((acc[(size_t)bx] + n / 2) / n);
+      }
     }
-    uint8_t* d = out.row(by);
-    const int rows = y1 - y0;
-    for (int bx = 0; bx < sw; ++bx) {
-      const uint32_t n = (uint32_t)(rows * (std::min(f.width, (bx + 1) * factor) - bx * factor));
-      d[bx] = (uint8_t)((acc[(size_t)bx] + n / 2) / n);
-    }
-  }
+  });
 }
 
 namespace {
@@ -197,7 +202,8 @@ const uint8_t* Upsampler<N>::row(int y) {
     const uint32_t wx = mWx[(size_t)x];
     const uint16_t* p = &mTmp[(size_t)x0 * N];
     const uint16_t* q = &mTmp[(size_t)x1 * N];
-    for (int k = 0; k < N; ++k) out[(size_t)x * N + k] = (uint8_t)((p[k] * (256u - wx) + q[k] * wx + 32768u) >> 16);
+    for (int k = 0; k < N; ++k)
+      out[(size_t)x * N + k] = (uint8_t)((p[k] * (256u - wx) + q[k] * wx + 32768u) >> 16);
   }
   return out;
 }

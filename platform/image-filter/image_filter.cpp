@@ -30,10 +30,44 @@ namespace imgfilter {
 
 bool isKnownCode(int code) {
   switch (code) {
-    case 201: case 202: case 203: case 204: case 205: case 206: case 207: case 208: case 209:
-    case 210: case 211: case 212: case 213: case 214: case 215: case 216: case 217: case 218:
-    case 400: case 410: case 412: case 417: case 418: case 419: case 420: case 421: case 422: case 423:
-    case 602: case 603: case 604: case 605: case 606: case 607: case 608: case 609: case 610: case 611:
+    case 201:
+    case 202:
+    case 203:
+    case 204:
+    case 205:
+    case 206:
+    case 207:
+    case 208:
+    case 209:
+    case 210:
+    case 211:
+    case 212:
+    case 213:
+    case 214:
+    case 215:
+    case 216:
+    case 217:
+    case 218:
+    case 400:
+    case 410:
+    case 412:
+    case 417:
+    case 418:
+    case 419:
+    case 420:
+    case 421:
+    case 422:
+    case 423:
+    case 602:
+    case 603:
+    case 604:
+    case 605:
+    case 606:
+    case 607:
+    case 608:
+    case 609:
+    case 610:
+    case 611:
       return true;
     default:
       return false;
@@ -43,30 +77,76 @@ bool isKnownCode(int code) {
 bool runLook(int code, const Frame& f) {
   if (!isKnownCode(code)) return false;
   switch (code) {
-    case 422: lookPastel(f); break;
-    case 419: lookDeep(f); break;
-    case 412: lookRetro(f); break;
-    case 421: lookFilm(f); break;
-    case 417: lookCalm(f); break;
-    case 418: lookDawn(f); break;
-    case 205: lookGreyscale(f); break;
-    case 420: lookEvergreen(f); break;
-    case 206: lookFaded(f); break;
-    case 410: lookOldPhoto(f); break;
-    case 602: lookBlur(f); break;
-    case 603: lookNostalgia(f); break;
-    case 212: lookSunshine(f); break;
-    case 203: lookVintage(f); break;
-    case 211: lookSharpen(f); break;
-    case 210: lookSoftGlow(f); break;
-    case 608: lookStardust(f); break;
-    case 609: lookLightFlare(f); break;
-    case 201: lookCartoon(f); break;
+    case 422:
+      lookPastel(f);
+      break;
+    case 419:
+      lookDeep(f);
+      break;
+    case 412:
+      lookRetro(f);
+      break;
+    case 421:
+      lookFilm(f);
+      break;
+    case 417:
+      lookCalm(f);
+      break;
+    case 418:
+      lookDawn(f);
+      break;
+    case 205:
+      lookGreyscale(f);
+      break;
+    case 420:
+      lookEvergreen(f);
+      break;
+    case 206:
+      lookFaded(f);
+      break;
+    case 410:
+      lookOldPhoto(f);
+      break;
+    case 602:
+      lookBlur(f);
+      break;
+    case 603:
+      lookNostalgia(f);
+      break;
+    case 212:
+      lookSunshine(f);
+      break;
+    case 203:
+      lookVintage(f);
+      break;
+    case 211:
+      lookSharpen(f);
+      break;
+    case 210:
+      lookSoftGlow(f);
+      break;
+    case 608:
+      lookStardust(f);
+      break;
+    case 609:
+      lookLightFlare(f);
+      break;
+    case 201:
+      lookCartoon(f);
+      break;
     // Codes the editor does not offer: a few simple tones, the rest unchanged.
-    case 202: lookSepia(f); break;
-    case 204: lookWarm(f); break;
-    case 207: lookCool(f); break;
-    default: lookIdentity(f); break;
+    case 202:
+      lookSepia(f);
+      break;
+    case 204:
+      lookWarm(f);
+      break;
+    case 207:
+      lookCool(f);
+      break;
+    default:
+      lookIdentity(f);
+      break;
   }
   return true;
 }
@@ -115,7 +195,8 @@ int applySurfaces(_image_filter_s* h) {
   }
   const bool same = h->inSurface == h->outSurface;
   tbm_surface_info_s in, out;
-  if (tbm_surface_map(h->inSurface, same ? (TBM_SURF_OPTION_READ | TBM_SURF_OPTION_WRITE) : TBM_SURF_OPTION_READ,
+  if (tbm_surface_map(h->inSurface,
+                      same ? (TBM_SURF_OPTION_READ | TBM_SURF_OPTION_WRITE) : TBM_SURF_OPTION_READ,
                       &in) != TBM_SURFACE_ERROR_NONE) {
     dlog_print(DLOG_ERROR, IF_TAG, "image_filter_apply: cannot map the input surface");
     return IMAGE_FILTER_ERROR_INVALID_OPERATION;
@@ -127,8 +208,8 @@ int applySurfaces(_image_filter_s* h) {
     dlog_print(DLOG_ERROR, IF_TAG, "image_filter_apply: cannot map the output surface");
     return IMAGE_FILTER_ERROR_INVALID_OPERATION;
   }
-  imgfilter::Frame f{in.planes[0].ptr, (int)in.planes[0].stride, out.planes[0].ptr, (int)out.planes[0].stride,
-                     w, hgt, inCh};
+  imgfilter::Frame f{
+      in.planes[0].ptr, (int)in.planes[0].stride, out.planes[0].ptr, (int)out.planes[0].stride, w, hgt, inCh};
   imgfilter::runLook(h->code, f);
   // The looks write in the input's channel order; turn it into the output's.
   if (inCh.a != outCh.a)
@@ -143,7 +224,8 @@ int applyBuffers(_image_filter_s* h) {
     dlog_print(DLOG_ERROR, IF_TAG, "image_filter_apply: input or output buffer missing");
     return IMAGE_FILTER_ERROR_INVALID_OPERATION;
   }
-  imgfilter::Frame f{h->inBuffer, h->width * 4, h->outBuffer, h->width * 4, h->width, h->height, imgfilter::kOrderARGB};
+  imgfilter::Frame f{h->inBuffer, h->width * 4, h->outBuffer,         h->width * 4,
+                     h->width,    h->height,    imgfilter::kOrderARGB};
   imgfilter::runLook(h->code, f);
   return IMAGE_FILTER_ERROR_NONE;
 }
@@ -184,10 +266,11 @@ int image_filter_set_output_by_tbm_surface(image_filter_h filter, tbm_surface_h 
   return IMAGE_FILTER_ERROR_NONE;
 }
 
-int image_filter_set_input_by_buffer(image_filter_h filter, const unsigned char* buffer, int width, int height,
-                                     uint32_t fourcc) {
+int image_filter_set_input_by_buffer(image_filter_h filter, const unsigned char* buffer, int width,
+                                     int height, uint32_t fourcc) {
   if (!filter || !buffer || width <= 0 || height <= 0 || width > kMaxSide || height > kMaxSide) {
-    dlog_print(DLOG_ERROR, IF_TAG, "image_filter_set_input_by_buffer: invalid parameter (%dx%d)", width, height);
+    dlog_print(DLOG_ERROR, IF_TAG, "image_filter_set_input_by_buffer: invalid parameter (%dx%d)", width,
+               height);
     return IMAGE_FILTER_ERROR_INVALID_PARAMETER;
   }
   if (filter->mode != IMAGE_FILTER_MODE_BUFFER) return IMAGE_FILTER_ERROR_INVALID_OPERATION;
@@ -227,6 +310,8 @@ int image_filter_apply(image_filter_h filter) {
   return filter->mode == IMAGE_FILTER_MODE_SURFACE ? applySurfaces(filter) : applyBuffers(filter);
 }
 
-int image_filter_is_supported(int code) { return imgfilter::isKnownCode(code) ? 1 : 0; }
+int image_filter_is_supported(int code) {
+  return imgfilter::isKnownCode(code) ? 1 : 0;
+}
 
 }  // extern "C"

@@ -43,8 +43,8 @@ int image_filter_set_output_by_tbm_surface(image_filter_h filter, tbm_surface_h 
 
 // Buffer mode: rows packed (stride = width x 4). The output buffer holds as
 // many bytes as the input and may be the input buffer itself.
-int image_filter_set_input_by_buffer(image_filter_h filter, const unsigned char* buffer, int width, int height,
-                                     uint32_t fourcc);
+int image_filter_set_input_by_buffer(image_filter_h filter, const unsigned char* buffer, int width,
+                                     int height, uint32_t fourcc);
 int image_filter_set_output_by_buffer(image_filter_h filter, unsigned char* buffer);
 
 // IMAGE_FILTER_ERROR_NOT_SUPPORTED for a code the library does not know.

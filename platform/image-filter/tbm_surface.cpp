@@ -98,6 +98,8 @@ int tbm_surface_get_height(tbm_surface_h surface) {
   return surface ? surface->height : TBM_SURFACE_ERROR_INVALID_PARAMETER;
 }
 
-tbm_format tbm_surface_get_format(tbm_surface_h surface) { return surface ? surface->format : 0; }
+tbm_format tbm_surface_get_format(tbm_surface_h surface) {
+  return surface ? surface->format : 0;
+}
 
 }  // extern "C"

@@ -256,23 +256,26 @@ TEST_F(CairoCanvasTest, DrawIconCentresThePngAndClipsIt) {
   EXPECT_TRUE(log.contains("Failed to load icon"));
 }
 
-// A one-pixel checkerboard shrunk about 10 times: the GOOD filter used for saving
-// averages it to an even grey; bilinear, used on screen, samples it and
-// aliases into strong light and dark pixels.
-TEST_F(CairoCanvasTest, GoodFilterDoesNotAliasWhenShrinkingALargeCrop) {
+// A one-pixel checkerboard shrunk about 10 times: the box-averaged
+// downscale of the save pass (and cairo's GOOD filter) give an even grey;
+// bilinear, used on screen, samples it and aliases into light and dark.
+TEST_F(CairoCanvasTest, SmoothDownscaleDoesNotAliasWhenShrinkingALargeCrop) {
   Bitmap* b = BitmapFactory::createBitmap(1000, 1000, BITMAP_FORMAT_BGRA);
   auto* p = reinterpret_cast<uint32_t*>(b->getPixels());
   for (int y = 0; y < 1000; y++)
     for (int x = 0; x < 1000; x++) p[y * 1000 + x] = ((x + y) & 1) ? 0xFFFFFFFFu : 0xFF000000u;
-  auto spread = [&](cairo_filter_t filter) {
+  auto spread = [&](cairo_filter_t filter, bool smooth) {
     CLyCairoCanvas c(mImage, 100, 100, false);
     c.setFilter(filter);
+    c.setSmoothDownscale(smooth);
     c.clear();
-    c.beginPath();
     // 97 rather than 100: a shrink by exactly 10 puts every bilinear sample
     // half-way between two texels, which hides the aliasing.
+    cairo_surface_t* s = c.createSurface(b);
+    c.beginPath();
     c.setRectPath(CLyFloatRectangle(0, 0, 97, 97));
-    c.drawBitmap(b, CLyFloatRectangle(0, 0, 97, 97));
+    c.drawBitmap(s, CLyFloatRectangle(0, 0, 97, 97), CLyRectangle(0, 0, 1000, 1000));
+    cairo_surface_destroy(s);
     // The largest distance from the true mean grey (127.5) inside the cell.
     int worst = 0;
     for (int y = 10; y < 90; y++)
@@ -280,7 +283,38 @@ TEST_F(CairoCanvasTest, GoodFilterDoesNotAliasWhenShrinkingALargeCrop) {
         worst = std::max(worst, std::abs(2 * (int)(px(c, x, y) & 0xFF) - 255) / 2);
     return worst;
   };
-  EXPECT_LT(spread(CAIRO_FILTER_GOOD), 12);
-  EXPECT_GT(spread(CAIRO_FILTER_BILINEAR), 100);
+  EXPECT_LT(spread(CAIRO_FILTER_BILINEAR, true), 12);
+  EXPECT_LT(spread(CAIRO_FILTER_GOOD, false), 12);
+  EXPECT_GT(spread(CAIRO_FILTER_BILINEAR, false), 100);
+  delete b;
+}
+
+TEST_F(CairoCanvasTest, SmoothDownscaleKeepsTheSourceRectangleInPlace) {
+  CLyCairoCanvas c(mImage, CLyRectangle(10, 10, 100, 100), false);
+  c.setSmoothDownscale(true);
+  Bitmap* b = quadrants(400, 400);
+  cairo_surface_t* s = c.createSurface(b);
+  c.clear();
+  c.beginPath();
+  c.setRectPath(CLyFloatRectangle(10, 10, 100, 100));
+  c.drawBitmap(s, CLyFloatRectangle(10, 10, 100, 100), CLyRectangle(0, 0, 400, 400));  // 4x smaller
+  EXPECT_EQ(0xFFFF0000u, px(c, 20, 20));
+  EXPECT_EQ(0xFF00FF00u, px(c, 80, 20));
+  EXPECT_EQ(0xFF0000FFu, px(c, 20, 80));
+  EXPECT_EQ(0xFFFFFFFFu, px(c, 80, 80));
+  // Only the green quadrant (200, 0, 200, 200), 3 times smaller, at an odd offset.
+  c.clear();
+  c.beginPath();
+  c.setRectPath(CLyFloatRectangle(10, 10, 66, 66));
+  c.drawBitmap(s, CLyFloatRectangle(10, 10, 66, 66), CLyRectangle(200, 0, 200, 200));
+  for (int y : {1, 33, 64})
+    for (int x : {1, 33, 64}) EXPECT_EQ(0xFF00FF00u, px(c, x, y)) << x << "," << y;
+  // A crop reaching past the bitmap is cut to it rather than read out of bounds.
+  c.clear();
+  c.beginPath();
+  c.setRectPath(CLyFloatRectangle(10, 10, 50, 50));
+  c.drawBitmap(s, CLyFloatRectangle(10, 10, 50, 50), CLyRectangle(300, 300, 200, 200));
+  EXPECT_EQ(0xFFFFFFFFu, px(c, 5, 5));
+  cairo_surface_destroy(s);
   delete b;
 }

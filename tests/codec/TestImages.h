@@ -5,11 +5,7 @@
 // giflib, BMP and WBMP by hand. Pixels come from a function of (x, y) so
 // tests can check where each part of the picture ended up.
 
-#include <gif_lib.h>
-#include <jpeglib.h>
-#include <libexif/exif-data.h>
-#include <png.h>
-
+#include <cstddef>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -17,6 +13,12 @@
 #include <functional>
 #include <string>
 #include <vector>
+
+// jpeglib.h needs size_t and FILE declared first.
+#include <gif_lib.h>
+#include <jpeglib.h>
+#include <libexif/exif-data.h>
+#include <png.h>
 
 namespace pictavo::test {
 

@@ -58,7 +58,8 @@ TEST(JSON, ParseFailuresThrowAndWrongRootIsEmpty) {
   EXPECT_THROW(JSONObject(std::string("")), std::exception);
   EXPECT_THROW(JSONObject(std::string("   ")), std::exception);
   EXPECT_THROW(JSONArray(std::string("")), std::exception);
-  EXPECT_TRUE(capture.contains("error = ") || capture.contains("WASSERT! Let success parse, It must be success."));
+  EXPECT_TRUE(capture.contains("error = ") ||
+              capture.contains("WASSERT! Let success parse, It must be success."));
 
   capture.clear();
   JSONObject notObject(std::string("[1, 2]"));

@@ -19,10 +19,10 @@ inline std::vector<uint8_t> makeImage(int width, int height, uint32_t seed = 1) 
       const int noise = (int)((s >> 24) % 41) - 20;
       uint8_t* p = &px[((size_t)y * (size_t)width + (size_t)x) * 4];
       auto clampb = [](int v) { return (uint8_t)(v < 0 ? 0 : (v > 255 ? 255 : v)); };
-      p[0] = clampb(40 + 170 * y / (height > 1 ? height - 1 : 1) + noise);            // blue
-      p[1] = clampb(30 + 190 * x / (width > 1 ? width - 1 : 1) + noise / 2);          // green
+      p[0] = clampb(40 + 170 * y / (height > 1 ? height - 1 : 1) + noise);                         // blue
+      p[1] = clampb(30 + 190 * x / (width > 1 ? width - 1 : 1) + noise / 2);                       // green
       p[2] = clampb(220 - 150 * (x + y) / (width + height > 2 ? width + height - 2 : 1) + noise);  // red
-      p[3] = (uint8_t)(255 - ((x * 7 + y * 3) % 64));                                 // alpha
+      p[3] = (uint8_t)(255 - ((x * 7 + y * 3) % 64));                                              // alpha
     }
   return px;
 }
@@ -36,8 +36,8 @@ inline std::vector<uint8_t> reversed(const std::vector<uint8_t>& px) {
 }
 
 // Applies an effect to a copy of `src` (format 8 or 9); returns the result bytes.
-inline std::vector<uint8_t> apply(const std::vector<uint8_t>& src, int width, int height, int format, int effect,
-                                  int* rc = nullptr) {
+inline std::vector<uint8_t> apply(const std::vector<uint8_t>& src, int width, int height, int format,
+                                  int effect, int* rc = nullptr) {
   std::vector<uint8_t> in = src, out(src.size(), 0);
   IeImageInfo s{width, height, (uint16_t)format, in.data()};
   IeImageInfo d{width, height, 0, out.data()};

@@ -2,6 +2,8 @@
 // filter-code tables, sizes, determinism and threads.
 #include <gtest/gtest.h>
 
+#include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <set>
 #include <string>
@@ -26,17 +28,25 @@ std::vector<int> offeredEffects() {
 }  // namespace
 
 TEST(EffectTables, EffectTableIsTheEditorsNineteenInDisplayOrder) {
-  const std::pair<const char*, int> expected[] = {
-      {"IDS_IMGE_BUTTON_PASTEL_M_EFFECT_ABB", 35}, {"IDS_IMGE_BUTTON_DEEP_M_EFFECT_ABB", 32},
-      {"IDS_IV_OPT_RETRO_M_EFFECT", 15},           {"IDS_IMGE_BUTTON_FILM_M_EFFECT_ABB", 34},
-      {"IDS_IMGE_BUTTON_CALM_M_EFFECT_ABB", 30},   {"IDS_IMGE_BUTTON_DAWN_M_EFFECT_ABB", 31},
-      {"IDS_IV_OPT_GREYSCALE_M_EFFECT", 3},        {"IDS_IMGE_BUTTON_EVERGREEN_M_EFFECT_ABB", 33},
-      {"IDS_IV_OPT_FADED_COLOURS_M_EFFECT", 5},    {"IDS_IV_OPT_OLD_PHOTO_M_EFFECT", 1},
-      {"IDS_IV_OPT_BLUR_M_EFFECT", 14},            {"IDS_IV_OPT_NOSTALGIA_M_EFFECT", 17},
-      {"IDS_IV_OPT_SUNSHINE_M_EFFECT", 16},        {"IDS_IV_OPT_VINTAGE_M_EFFECT", 0},
-      {"IDS_IV_OPT_SHARPEN_M_EFFECT", 8},          {"IDS_IV_OPT_SOFT_GLOW_M_EFFECT", 9},
-      {"IDS_IMGE_BUTTON_STARDUST_M_EFFECT_ABB", 22}, {"IDS_IMGE_BUTTON_LIGHT_FLARE_M_EFFECT", 23},
-      {"IDS_IV_OPT_CARTOON_M_EFFECT", 7}};
+  const std::pair<const char*, int> expected[] = {{"IDS_IMGE_BUTTON_PASTEL_M_EFFECT_ABB", 35},
+                                                  {"IDS_IMGE_BUTTON_DEEP_M_EFFECT_ABB", 32},
+                                                  {"IDS_IV_OPT_RETRO_M_EFFECT", 15},
+                                                  {"IDS_IMGE_BUTTON_FILM_M_EFFECT_ABB", 34},
+                                                  {"IDS_IMGE_BUTTON_CALM_M_EFFECT_ABB", 30},
+                                                  {"IDS_IMGE_BUTTON_DAWN_M_EFFECT_ABB", 31},
+                                                  {"IDS_IV_OPT_GREYSCALE_M_EFFECT", 3},
+                                                  {"IDS_IMGE_BUTTON_EVERGREEN_M_EFFECT_ABB", 33},
+                                                  {"IDS_IV_OPT_FADED_COLOURS_M_EFFECT", 5},
+                                                  {"IDS_IV_OPT_OLD_PHOTO_M_EFFECT", 1},
+                                                  {"IDS_IV_OPT_BLUR_M_EFFECT", 14},
+                                                  {"IDS_IV_OPT_NOSTALGIA_M_EFFECT", 17},
+                                                  {"IDS_IV_OPT_SUNSHINE_M_EFFECT", 16},
+                                                  {"IDS_IV_OPT_VINTAGE_M_EFFECT", 0},
+                                                  {"IDS_IV_OPT_SHARPEN_M_EFFECT", 8},
+                                                  {"IDS_IV_OPT_SOFT_GLOW_M_EFFECT", 9},
+                                                  {"IDS_IMGE_BUTTON_STARDUST_M_EFFECT_ABB", 22},
+                                                  {"IDS_IMGE_BUTTON_LIGHT_FLARE_M_EFFECT", 23},
+                                                  {"IDS_IV_OPT_CARTOON_M_EFFECT", 7}};
   ASSERT_EQ(IE_Engine_Effect_Count(), 19);
   for (int i = 0; i < 19; ++i) {
     EXPECT_STREQ(IE_Engine_Effect_Get(i)->labelId, expected[i].first) << i;
@@ -47,8 +57,9 @@ TEST(EffectTables, EffectTableIsTheEditorsNineteenInDisplayOrder) {
 }
 
 TEST(EffectTables, FilterCodesByEffectNumberAnd400AboveTheTable) {
-  const int codes[37] = {203, 410, 204, 205, 202, 206, 213, 201, 211, 210, 207, 605, 208, 606, 602, 412, 212, 603, 604,
-                         209, 607, 214, 608, 609, 610, 611, 215, 218, 217, 216, 417, 418, 419, 420, 421, 422, 423};
+  const int codes[37] = {203, 410, 204, 205, 202, 206, 213, 201, 211, 210, 207, 605, 208,
+                         606, 602, 412, 212, 603, 604, 209, 607, 214, 608, 609, 610, 611,
+                         215, 218, 217, 216, 417, 418, 419, 420, 421, 422, 423};
   for (int n = 0; n < 37; ++n) EXPECT_EQ(IE_Engine_Filter_Code(n), codes[n]) << n;
   EXPECT_EQ(IE_Engine_Filter_Code(37), 400);
   EXPECT_EQ(IE_Engine_Filter_Code(1000), 400);
@@ -185,6 +196,23 @@ TEST(EngineContract, SameBytesOnSeveralThreadsSharingOneSource) {
   b.join();
   for (int t = 0; t < 2; ++t)
     for (size_t k = 0; k < results[t].size(); ++k)
-      EXPECT_EQ(results[t][k], expected[(k % effects.size() + (size_t)t * 7) % effects.size()]) << t << "/" << k;
+      EXPECT_EQ(results[t][k], expected[(k % effects.size() + (size_t)t * 7) % effects.size()])
+          << t << "/" << k;
   EXPECT_EQ(shared, original);
+}
+
+TEST(EffectTables, EveryLabelHasAnEnglishText) {
+  const char* res = getenv("PICTAVO_RES_DIR");
+  ASSERT_NE(res, nullptr);
+  FILE* f = fopen((std::string(res) + "/locale/en/LC_MESSAGES/pictavo.mo").c_str(), "rb");
+  ASSERT_NE(f, nullptr) << "compiled English catalogue missing";
+  std::string mo;
+  char buf[4096];
+  for (size_t n; (n = fread(buf, 1, sizeof buf, f)) > 0;) mo.append(buf, n);
+  fclose(f);
+  for (int i = 0; i < IE_Engine_Effect_Count(); ++i) {
+    const std::string id = IE_Engine_Effect_Get(i)->labelId;
+    EXPECT_NE(mo.find(id + '\0'), std::string::npos) << id;
+  }
+  EXPECT_NE(mo.find(std::string("Faded colours") + '\0'), std::string::npos);
 }

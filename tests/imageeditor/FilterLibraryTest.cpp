@@ -12,15 +12,18 @@ using effects_test::reversed;
 
 namespace {
 
-const int kAllCodes[] = {201, 202, 203, 204, 205, 206, 207, 208, 209, 210, 211, 212, 213, 214, 215, 216, 217, 218, 400,
-                         410, 412, 417, 418, 419, 420, 421, 422, 423, 602, 603, 604, 605, 606, 607, 608, 609, 610, 611};
+const int kAllCodes[] = {201, 202, 203, 204, 205, 206, 207, 208, 209, 210, 211, 212, 213,
+                         214, 215, 216, 217, 218, 400, 410, 412, 417, 418, 419, 420, 421,
+                         422, 423, 602, 603, 604, 605, 606, 607, 608, 609, 610, 611};
 
 // Runs a code in buffer mode (format "BGRA": memory A, R, G, B).
-std::vector<uint8_t> runBuffer(const std::vector<uint8_t>& argb, int w, int h, int code, bool inPlace = false) {
+std::vector<uint8_t> runBuffer(const std::vector<uint8_t>& argb, int w, int h, int code,
+                               bool inPlace = false) {
   std::vector<uint8_t> in = argb, out(argb.size(), 0);
   image_filter_h f = nullptr;
   EXPECT_EQ(image_filter_create(&f, IMAGE_FILTER_MODE_BUFFER), IMAGE_FILTER_ERROR_NONE);
-  EXPECT_EQ(image_filter_set_input_by_buffer(f, in.data(), w, h, IMAGE_FILTER_FORMAT_BGRA), IMAGE_FILTER_ERROR_NONE);
+  EXPECT_EQ(image_filter_set_input_by_buffer(f, in.data(), w, h, IMAGE_FILTER_FORMAT_BGRA),
+            IMAGE_FILTER_ERROR_NONE);
   EXPECT_EQ(image_filter_set_output_by_buffer(f, inPlace ? in.data() : out.data()), IMAGE_FILTER_ERROR_NONE);
   EXPECT_EQ(image_filter_set_filter(f, code), IMAGE_FILTER_ERROR_NONE);
   EXPECT_EQ(image_filter_apply(f), IMAGE_FILTER_ERROR_NONE);
@@ -32,7 +35,8 @@ tbm_surface_h surfaceWith(const std::vector<uint8_t>& px, int w, int h, tbm_form
   tbm_surface_h s = tbm_surface_create(w, h, format);
   tbm_surface_info_s info;
   EXPECT_EQ(tbm_surface_map(s, TBM_SURF_OPTION_WRITE, &info), TBM_SURFACE_ERROR_NONE);
-  for (int y = 0; y < h; ++y) memcpy(info.planes[0].ptr + (size_t)y * info.planes[0].stride, &px[(size_t)y * w * 4], (size_t)w * 4);
+  for (int y = 0; y < h; ++y)
+    memcpy(info.planes[0].ptr + (size_t)y * info.planes[0].stride, &px[(size_t)y * w * 4], (size_t)w * 4);
   tbm_surface_unmap(s);
   return s;
 }
@@ -85,13 +89,15 @@ TEST(ImageFilter, RefusesWrongModesUnknownCodesAndMissingImages) {
   EXPECT_EQ(image_filter_apply(f), IMAGE_FILTER_ERROR_INVALID_OPERATION);  // no buffers
   unsigned char px[16] = {};
   EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 2, 2, 0x41424344), IMAGE_FILTER_ERROR_NOT_SUPPORTED);
-  EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 0, 2, IMAGE_FILTER_FORMAT_BGRA), IMAGE_FILTER_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 0, 2, IMAGE_FILTER_FORMAT_BGRA),
+            IMAGE_FILTER_ERROR_INVALID_PARAMETER);
   EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 100000, 2, IMAGE_FILTER_FORMAT_BGRA),
             IMAGE_FILTER_ERROR_INVALID_PARAMETER);
   image_filter_destroy(f);
 
   ASSERT_EQ(image_filter_create(&f, IMAGE_FILTER_MODE_SURFACE), IMAGE_FILTER_ERROR_NONE);
-  EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 2, 2, IMAGE_FILTER_FORMAT_BGRA), IMAGE_FILTER_ERROR_INVALID_OPERATION);
+  EXPECT_EQ(image_filter_set_input_by_buffer(f, px, 2, 2, IMAGE_FILTER_FORMAT_BGRA),
+            IMAGE_FILTER_ERROR_INVALID_OPERATION);
   EXPECT_EQ(image_filter_set_input_by_tbm_surface(f, s), IMAGE_FILTER_ERROR_NONE);
   EXPECT_EQ(image_filter_set_filter(f, 205), IMAGE_FILTER_ERROR_NONE);
   EXPECT_EQ(image_filter_apply(f), IMAGE_FILTER_ERROR_INVALID_OPERATION);  // no output

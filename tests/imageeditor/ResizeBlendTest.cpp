@@ -31,7 +31,9 @@ TEST(AlphaBlending, IntermediateStrengthsFollowTheTruncatedWeight) {
     ASSERT_EQ(IEL_Alpha_blending(&s, &d, alpha), IE_ERROR_NONE);
     const unsigned a = (unsigned char)(alpha / 100.0f * 255.0f);
     for (size_t i = 0; i < dst.size(); ++i)
-      if (i % 4 != 3) ASSERT_EQ(dst[i], (before[i] * (255 - a) + src[i] * a) >> 8) << alpha << " @" << i;
+      if (i % 4 != 3) {
+        ASSERT_EQ(dst[i], (before[i] * (255 - a) + src[i] * a) >> 8) << alpha << " @" << i;
+      }
   }
 }
 
@@ -70,7 +72,9 @@ TEST(PercentBlending, BlendsFirstOverSecondAndNeverWritesTheFourthByte) {
   auto inPlace = first;
   IEL_Percent_blending(inPlace.data(), second.data(), inPlace.data(), 6, 4, 60);
   for (size_t i = 0; i < out.size(); ++i)
-    if (i % 4 != 3) EXPECT_EQ(inPlace[i], out[i]);
+    if (i % 4 != 3) {
+      EXPECT_EQ(inPlace[i], out[i]);
+    }
 }
 
 TEST(PercentBlending, OutOfRangePercentIsClampedAndBadBuffersAreRefused) {
@@ -105,7 +109,8 @@ TEST(Resize, SameSizeSamplesRowYAtYMinusAHalf) {
   ASSERT_EQ(IEL_resize_image(&s, &d), IE_ERROR_NONE);
   for (int y = 0; y < 6; ++y) {
     // Row 0 is row 0; every later one the even blend of rows y - 1 and y.
-    const int expect = y == 0 ? rows[0] : (int)(rows[(size_t)y - 1] + (rows[(size_t)y] - rows[(size_t)y - 1]) * 0.5f + 0.5f);
+    const int expect =
+        y == 0 ? rows[0] : (int)(rows[(size_t)y - 1] + (rows[(size_t)y] - rows[(size_t)y - 1]) * 0.5f + 0.5f);
     for (int k = 0; k < 20; ++k) ASSERT_EQ(out[(size_t)y * 20 + (size_t)k], expect) << "row " << y;
   }
 }
@@ -124,7 +129,8 @@ TEST(Resize, SameSizeBlendsColumnsLikewiseAndKeepsChannelOrder) {
 }
 
 TEST(Resize, ConstantColourSurvivesAnyScaleAndOnePixelSidesStayInside) {
-  for (auto [sw, sh, dw, dh] : {std::array{1, 1, 9, 7}, {1, 5, 4, 4}, {5, 1, 3, 8}, {40, 30, 7, 5}, {3, 3, 64, 48}}) {
+  for (auto [sw, sh, dw, dh] :
+       {std::array{1, 1, 9, 7}, {1, 5, 4, 4}, {5, 1, 3, 8}, {40, 30, 7, 5}, {3, 3, 64, 48}}) {
     std::vector<uint8_t> src((size_t)sw * sh * 4);
     for (size_t i = 0; i < src.size(); i += 4) {
       src[i] = 12;

@@ -20,13 +20,20 @@ CLyPoint randomDrag(std::mt19937& rng) {
   std::uniform_int_distribution<int> mode(0, 6), sign(0, 1), small(1, 20), large(60, 700), tiny(1, 3);
   auto s = [&] { return sign(rng) ? 1 : -1; };
   switch (mode(rng)) {
-    case 0: return CLyPoint(s() * small(rng), 0);
-    case 1: return CLyPoint(0, s() * small(rng));
-    case 2: return CLyPoint(s() * small(rng), s() * small(rng));
-    case 3: return CLyPoint(s() * large(rng), 0);
-    case 4: return CLyPoint(0, s() * large(rng));
-    case 5: return CLyPoint(s() * large(rng), s() * large(rng));
-    default: return CLyPoint(s() * tiny(rng), s() * tiny(rng));
+    case 0:
+      return CLyPoint(s() * small(rng), 0);
+    case 1:
+      return CLyPoint(0, s() * small(rng));
+    case 2:
+      return CLyPoint(s() * small(rng), s() * small(rng));
+    case 3:
+      return CLyPoint(s() * large(rng), 0);
+    case 4:
+      return CLyPoint(0, s() * large(rng));
+    case 5:
+      return CLyPoint(s() * large(rng), s() * large(rng));
+    default:
+      return CLyPoint(s() * tiny(rng), s() * tiny(rng));
   }
 }
 
@@ -43,7 +50,7 @@ TEST_P(LayoutInvariants, RandomHandlerDragsKeepTheTiling) {
   ASSERT_NE(layout, nullptr);
   ASSERT_EQ(layout->getImageCount(), c.count);
 
-  const int kSeeds = 12, kSteps = 60;
+  const int kSeeds = 40, kSteps = 150;
   for (int focus = 0; focus < c.count; ++focus) {
     const CLyGridImageInfo* info = layout->getImageInfo(focus);
     for (int h = 0; h < info->getHandlerCount(); ++h) {
@@ -62,14 +69,17 @@ TEST_P(LayoutInvariants, RandomHandlerDragsKeepTheTiling) {
           const auto after = snapshot(list);
           const std::string fault = checkInvariants(after, initial);
           if (!fault.empty()) {
-            ADD_FAILURE() << c.count << " photos, layout " << c.index << ", focus " << focus << ", handler " << h
-                          << ", seed " << seed << ", step " << step << ", drag (" << drag.x << ", " << drag.y
-                          << "): " << fault << "\n before:" << describe(before) << "\n after: " << describe(after);
+            ADD_FAILURE() << c.count << " photos, layout " << c.index << ", focus " << focus << ", handler "
+                          << h << ", seed " << seed << ", step " << step << ", drag (" << drag.x << ", "
+                          << drag.y << "): " << fault << "\n before:" << describe(before)
+                          << "\n after: " << describe(after);
             return;
           }
           for (int i = 0; i < c.count; ++i) {
-            if (std::fabs(after[i].x1 - initial[i].x1) > 1e-4 || std::fabs(after[i].y1 - initial[i].y1) > 1e-4 ||
-                std::fabs(after[i].x2 - initial[i].x2) > 1e-4 || std::fabs(after[i].y2 - initial[i].y2) > 1e-4) {
+            if (std::fabs(after[i].x1 - initial[i].x1) > 1e-4 ||
+                std::fabs(after[i].y1 - initial[i].y1) > 1e-4 ||
+                std::fabs(after[i].x2 - initial[i].x2) > 1e-4 ||
+                std::fabs(after[i].y2 - initial[i].y2) > 1e-4) {
               moved = true;
             }
           }
@@ -84,7 +94,8 @@ TEST_P(LayoutInvariants, RandomHandlerDragsKeepTheTiling) {
 std::vector<Case> allLayouts() {
   std::vector<Case> cases;
   for (int count = 2; count <= 6; ++count) {
-    for (int index = 0; index < loadedCatalogue().getLayoutCount(count); ++index) cases.push_back({count, index});
+    for (int index = 0; index < loadedCatalogue().getLayoutCount(count); ++index)
+      cases.push_back({count, index});
   }
   return cases;
 }

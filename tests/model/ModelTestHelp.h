@@ -19,7 +19,8 @@ inline CLyMultiGridStyleManager& loadedCatalogue() {
   return CLyMultiGridStyleManager::getInstance();
 }
 
-inline void fillList(CLyMultiGridDrawRectList& list, int count, int index, int width = 1000, int height = 800) {
+inline void fillList(CLyMultiGridDrawRectList& list, int count, int index, int width = 1000,
+                     int height = 800) {
   float rects[6][4] = {};
   loadedCatalogue().getDrawRects(count, 0, index, rects);
   list.clear(true);
@@ -39,7 +40,8 @@ inline std::vector<CLyFloatRectangle> snapshot(const CLyMultiGridDrawRectList& l
 inline std::string describe(const std::vector<CLyFloatRectangle>& cells) {
   std::ostringstream out;
   for (size_t i = 0; i < cells.size(); ++i) {
-    out << " [" << i << "] " << cells[i].x1 << "," << cells[i].y1 << " - " << cells[i].x2 << "," << cells[i].y2;
+    out << " [" << i << "] " << cells[i].x1 << "," << cells[i].y1 << " - " << cells[i].x2 << ","
+        << cells[i].y2;
   }
   return out.str();
 }
@@ -61,7 +63,8 @@ inline std::string checkInvariants(const std::vector<CLyFloatRectangle>& cells,
       const CLyFloatRectangle& d = cells[j];
       const double ox = std::min(c.x2, d.x2) - std::max(c.x1, d.x1);
       const double oy = std::min(c.y2, d.y2) - std::max(c.y1, d.y1);
-      if (ox > tol && oy > tol) return "cells " + std::to_string(i) + " and " + std::to_string(j) + " overlap";
+      if (ox > tol && oy > tol)
+        return "cells " + std::to_string(i) + " and " + std::to_string(j) + " overlap";
     }
     const CLyFloatRectangle& s = initial[i];
     if ((s.x1 == 0.0f && c.x1 != 0.0f) || (s.y1 == 0.0f && c.y1 != 0.0f) || (s.x2 == 1.0f && c.x2 != 1.0f) ||

@@ -57,7 +57,7 @@ TEST(StyleParser, DirectionsMapToFlagsExactly) {
   const struct {
     const char* text;
     int flags;
-  } cases[] = {{"R", 1}, {"L", 2}, {"U", 4}, {"D", 8}, {"UR", 5}, {"RU", 5}, {"RD", 9},
+  } cases[] = {{"R", 1},  {"L", 2},  {"U", 4},  {"D", 8},   {"UR", 5},  {"RU", 5}, {"RD", 9},
                {"DR", 9}, {"LU", 6}, {"UL", 6}, {"LD", 10}, {"DL", 10}, {"ru", 0}, {"RL", 0}};
   for (const auto& c : cases) {
     JSONObject object{handlerWith(c.text, "[[1, 1]]")};
@@ -108,7 +108,8 @@ TEST(StyleParser, MalformedHandlersThrowWithTheirLog) {
 
 TEST(StyleParser, CellsAndLayouts) {
   JSONObject cellObject{R"({"rect": [0.25, 0.5], "min_width": 0.14, "min_height": 0.2,
-                           "handlers": [)" + std::string(kHandler) + "]}"};
+                           "handlers": [)" +
+                        std::string(kHandler) + "]}"};
   CLyGridImageInfo cell(&cellObject);
   float rect[4] = {9, 9, 9, 9};
   ASSERT_TRUE(cell.getDrawRect(rect));
@@ -145,7 +146,8 @@ TEST(StyleParser, MalformedCellsAndLayoutsThrowWithTheirLog) {
       {R"({"rect": [0, 0, 1, 1], "handlers": [{}]})", false, "hVariation is null! pArray is nullptr!"},
       {R"({})", true, "pArray is nullptr!"},
       {R"({"images": [1]})", true, "__obj is nullptr!"},
-      {R"({"images": [)" + cell + "," + cell + "," + cell + "," + cell + "," + cell + "," + cell + "," + cell + "]}",
+      {R"({"images": [)" + cell + "," + cell + "," + cell + "," + cell + "," + cell + "," + cell + "," +
+           cell + "]}",
        true, "images count(7) is bigger than 6"},
       {R"({"images": [{"rect": [0,0,1,1], "handlers": [{"base_image_id": 3, "h_variation": [],
           "v_variation": [], "image_count": 1}]}]})",

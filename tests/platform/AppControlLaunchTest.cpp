@@ -256,7 +256,8 @@ TEST_F(AppControlLaunchTest, RepliesToLaunchRequests) {
   app_control_create(&launch);
   app_control_h reply = nullptr;
   app_control_create(&reply);
-  EXPECT_EQ(app_control_reply_to_launch_request(reply, launch, APP_CONTROL_RESULT_FAILED), APP_CONTROL_ERROR_NONE);
+  EXPECT_EQ(app_control_reply_to_launch_request(reply, launch, APP_CONTROL_RESULT_FAILED),
+            APP_CONTROL_ERROR_NONE);
   EXPECT_EQ(app_control_reply_to_launch_request(nullptr, launch, APP_CONTROL_RESULT_FAILED),
             APP_CONTROL_ERROR_INVALID_PARAMETER);
   EXPECT_EQ(app_control_reply_to_launch_request(reply, nullptr, APP_CONTROL_RESULT_FAILED),

@@ -6,8 +6,8 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <vector>
 #include <string>
+#include <vector>
 
 #include "PlatformTestImages.h"
 #include "platform/media_content.h"
@@ -124,7 +124,8 @@ TEST_F(MediaContentTest, TwoProcessesWritingAtOnceKeepTheDatabaseWhole) {
   constexpr int kFilesPerProcess = 40;
   for (int p = 0; p < 2; ++p) {
     for (int i = 0; i < kFilesPerProcess; ++i) {
-      ASSERT_TRUE(writeTestPng(mDir.file("p" + std::to_string(p) + "_" + std::to_string(i) + ".png"), 8 + i, 8));
+      ASSERT_TRUE(
+          writeTestPng(mDir.file("p" + std::to_string(p) + "_" + std::to_string(i) + ".png"), 8 + i, 8));
     }
   }
   pid_t children[2];

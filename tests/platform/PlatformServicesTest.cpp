@@ -38,13 +38,16 @@ TEST(ResourceManagerTest, ResolvesNamesInsideTheResourceDirectory) {
             APP_RESOURCE_ERROR_NONE);
   std::string color = take(path);
   EXPECT_NE(color.find("/code/changeableColorInfo.xml"), std::string::npos);
-  ASSERT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_LAYOUT, "edje/LyTheme.edj", &path), APP_RESOURCE_ERROR_NONE);
+  ASSERT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_LAYOUT, "edje/LyTheme.edj", &path),
+            APP_RESOURCE_ERROR_NONE);
   EXPECT_NE(take(path).find("/edje/LyTheme.edj"), std::string::npos);
   // A layout may also be named without its folder.
-  ASSERT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_LAYOUT, "LyTheme.edj", &path), APP_RESOURCE_ERROR_NONE);
+  ASSERT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_LAYOUT, "LyTheme.edj", &path),
+            APP_RESOURCE_ERROR_NONE);
   free(path);
 
-  EXPECT_NE(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "images/none.png", &path), APP_RESOURCE_ERROR_NONE);
+  EXPECT_NE(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "images/none.png", &path),
+            APP_RESOURCE_ERROR_NONE);
   EXPECT_EQ(path, nullptr);
   // Names must stay inside the directory.
   EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "../res/code/changeableColorInfo.xml", &path),
@@ -53,8 +56,10 @@ TEST(ResourceManagerTest, ResolvesNamesInsideTheResourceDirectory) {
             APP_RESOURCE_ERROR_INVALID_PARAMETER);
   EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "code/../../x", &path),
             APP_RESOURCE_ERROR_INVALID_PARAMETER);
-  EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, nullptr, &path), APP_RESOURCE_ERROR_INVALID_PARAMETER);
-  EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "code", nullptr), APP_RESOURCE_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, nullptr, &path),
+            APP_RESOURCE_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "code", nullptr),
+            APP_RESOURCE_ERROR_INVALID_PARAMETER);
   // A folder is not a resource.
   EXPECT_NE(app_resource_manager_get(APP_RESOURCE_TYPE_IMAGE, "code", &path), APP_RESOURCE_ERROR_NONE);
   EXPECT_EQ(app_resource_manager_release(), APP_RESOURCE_ERROR_NONE);
@@ -80,8 +85,8 @@ TEST(ThemeServiceTest, ColourTableOfTheResourcesHoldsTheScreensCodes) {
     EXPECT_LE(a, 255);
   }
   int r = 7;
-  EXPECT_EQ(uxt_theme_get_color("NOPE", &r, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
-                                nullptr, nullptr, nullptr),
+  EXPECT_EQ(uxt_theme_get_color("NOPE", &r, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
+                                nullptr, nullptr, nullptr, nullptr),
             UXT_THEME_ERROR_NOT_FOUND);
   EXPECT_EQ(r, 7);
   EXPECT_EQ(uxt_theme_delete_color_table(table), UXT_THEME_ERROR_NONE);
@@ -106,21 +111,22 @@ TEST(ThemeServiceTest, StylesOverrideAndObjectsTakeColours) {
   uxt_theme_set_style(0);
   uxt_theme_set_color_table(table);
   int r, g, b, a, orr, og, ob, oa, sr, sg, sb, sa;
-  ASSERT_EQ(uxt_theme_get_color("X1", &r, &g, &b, &a, &orr, &og, &ob, &oa, &sr, &sg, &sb, &sa), UXT_THEME_ERROR_NONE);
+  ASSERT_EQ(uxt_theme_get_color("X1", &r, &g, &b, &a, &orr, &og, &ob, &oa, &sr, &sg, &sb, &sa),
+            UXT_THEME_ERROR_NONE);
   EXPECT_EQ((std::vector<int>{r, g, b, a}), (std::vector<int>{255, 0, 0, 128}));
   EXPECT_EQ((std::vector<int>{orr, og, ob, oa}), (std::vector<int>{0, 255, 0, 255}));
   // The shadow defaults to the main colour.
   EXPECT_EQ((std::vector<int>{sr, sg, sb, sa}), (std::vector<int>{255, 0, 0, 128}));
-  EXPECT_EQ(uxt_theme_get_color("BAD", &r, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
-                                nullptr, nullptr, nullptr),
+  EXPECT_EQ(uxt_theme_get_color("BAD", &r, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
+                                nullptr, nullptr, nullptr, nullptr),
             UXT_THEME_ERROR_NOT_FOUND);
-  ASSERT_EQ(uxt_theme_get_color("X2", &r, &g, &b, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
-                                nullptr, nullptr),
+  ASSERT_EQ(uxt_theme_get_color("X2", &r, &g, &b, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
+                                nullptr, nullptr, nullptr),
             UXT_THEME_ERROR_NONE);
   EXPECT_EQ(r, 1);
   uxt_theme_set_style(2);
-  ASSERT_EQ(uxt_theme_get_color("X2", &r, &g, &b, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
-                                nullptr, nullptr),
+  ASSERT_EQ(uxt_theme_get_color("X2", &r, &g, &b, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,
+                                nullptr, nullptr, nullptr),
             UXT_THEME_ERROR_NONE);
   EXPECT_EQ((std::vector<int>{r, g, b}), (std::vector<int>{10, 11, 12}));
   uxt_theme_set_style(0);
@@ -136,8 +142,8 @@ TEST(ThemeServiceTest, StylesOverrideAndObjectsTakeColours) {
 
   Evas_Object* button = elm_button_add(win);
   EXPECT_EQ(uxt_theme_object_replace_color(button, "B043", "X2"), UXT_THEME_ERROR_NONE);
-  EXPECT_TRUE(edje_object_color_class_get(elm_layout_edje_get(button), "B043", &r, &g, &b, &a, &orr, &og, &ob, &oa,
-                                          &sr, &sg, &sb, &sa));
+  EXPECT_TRUE(edje_object_color_class_get(elm_layout_edje_get(button), "B043", &r, &g, &b, &a, &orr, &og, &ob,
+                                          &oa, &sr, &sg, &sb, &sa));
   EXPECT_EQ((std::vector<int>{r, g, b}), (std::vector<int>{1, 2, 3}));
   EXPECT_EQ(uxt_theme_object_replace_color(rect, "B043", "X2"), UXT_THEME_ERROR_NOT_SUPPORTED);
   evas_object_del(win);
@@ -148,9 +154,11 @@ TEST(ThemeServiceTest, BrokenTablesAreRefused) {
   TempDir dir;
   EXPECT_EQ(uxt_theme_add_color_table(dir.file("missing.xml").c_str()), nullptr);
   EXPECT_EQ(uxt_theme_add_color_table(nullptr), nullptr);
-  EXPECT_EQ(uxt_theme_add_color_table(writeFile(dir, "empty.xml", "<ColorTable></ColorTable>").c_str()), nullptr);
+  EXPECT_EQ(uxt_theme_add_color_table(writeFile(dir, "empty.xml", "<ColorTable></ColorTable>").c_str()),
+            nullptr);
   EXPECT_EQ(uxt_theme_add_color_table(writeFile(dir, "junk.xml", "\x01\x02 not xml <<<<").c_str()), nullptr);
-  EXPECT_EQ(uxt_theme_add_font_table(writeFile(dir, "nofamily.xml", "<FontTable><Font code=\"T\"/></FontTable>").c_str()),
+  EXPECT_EQ(uxt_theme_add_font_table(
+                writeFile(dir, "nofamily.xml", "<FontTable><Font code=\"T\"/></FontTable>").c_str()),
             nullptr);
   EXPECT_EQ(uxt_theme_set_color_table(nullptr), UXT_THEME_ERROR_INVALID_PARAMETER);
   EXPECT_EQ(uxt_theme_delete_font_table(nullptr), UXT_THEME_ERROR_INVALID_PARAMETER);
@@ -226,20 +234,25 @@ TEST(SystemSettingsTest, LocaleLanguageFromTheEnvironment) {
   unsetenv("LANGUAGE");
   setenv("LANG", "de_DE.UTF-8", 1);
   char* value = nullptr;
-  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value), SYSTEM_SETTINGS_ERROR_NONE);
+  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value),
+            SYSTEM_SETTINGS_ERROR_NONE);
   EXPECT_EQ(take(value), "de_DE");
   setenv("LC_ALL", "fr_FR@euro", 1);
-  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value), SYSTEM_SETTINGS_ERROR_NONE);
+  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value),
+            SYSTEM_SETTINGS_ERROR_NONE);
   EXPECT_EQ(take(value), "fr_FR");
   setenv("LC_ALL", "C", 1);
   setenv("LANG", "POSIX", 1);
-  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value), SYSTEM_SETTINGS_ERROR_NONE);
+  ASSERT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, &value),
+            SYSTEM_SETTINGS_ERROR_NONE);
   EXPECT_EQ(take(value), "en_US");
   EXPECT_EQ(system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_LANGUAGE, nullptr),
             SYSTEM_SETTINGS_ERROR_INVALID_PARAMETER);
   const char* names[] = {"LC_ALL", "LC_MESSAGES", "LANG", "LANGUAGE"};
   for (int i = 0; i < 4; ++i) {
-    if (saved[i]) setenv(names[i], copies[i].c_str(), 1);
-    else unsetenv(names[i]);
+    if (saved[i])
+      setenv(names[i], copies[i].c_str(), 1);
+    else
+      unsetenv(names[i]);
   }
 }

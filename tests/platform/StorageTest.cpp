@@ -16,12 +16,16 @@ class ScopedEnv {
  public:
   ScopedEnv(const char* name, const char* value) : mName(name) {
     if (const char* old = getenv(name)) mOld = old, mHad = true;
-    if (value) setenv(name, value, 1);
-    else unsetenv(name);
+    if (value)
+      setenv(name, value, 1);
+    else
+      unsetenv(name);
   }
   ~ScopedEnv() {
-    if (mHad) setenv(mName.c_str(), mOld.c_str(), 1);
-    else unsetenv(mName.c_str());
+    if (mHad)
+      setenv(mName.c_str(), mOld.c_str(), 1);
+    else
+      unsetenv(mName.c_str());
   }
 
  private:
@@ -82,5 +86,6 @@ TEST(StorageTest, OneVariableMovesBothStorages) {
   EXPECT_NE(storage_get_external_memory_size(&info), STORAGE_ERROR_NONE);
   ASSERT_EQ(mkdir((dir.path() + "/sdcard").c_str(), 0755), 0);
   EXPECT_EQ(storage_get_external_memory_size(&info), STORAGE_ERROR_NONE);
-  EXPECT_EQ(take(storage_map_device_path("/opt/storage/sdcard/DCIM/Collage")), dir.path() + "/sdcard/DCIM/Collage");
+  EXPECT_EQ(take(storage_map_device_path("/opt/storage/sdcard/DCIM/Collage")),
+            dir.path() + "/sdcard/DCIM/Collage");
 }

@@ -96,9 +96,12 @@ TEST_F(UsageLogStoreTest, IncompleteRecordsAreRefused) {
   bundle_add_str(b, "feature", "CLAY");
   EXPECT_EQ(brelmo_log_manager_insert(handle, "http://example.com/log", b, nullptr, nullptr),
             BRELMO_LOG_ERROR_INVALID_PARAMETER);
-  EXPECT_EQ(brelmo_log_manager_insert(handle, nullptr, b, nullptr, nullptr), BRELMO_LOG_ERROR_INVALID_PARAMETER);
-  EXPECT_EQ(brelmo_log_manager_insert(nullptr, kUri, b, nullptr, nullptr), BRELMO_LOG_ERROR_INVALID_PARAMETER);
-  EXPECT_EQ(brelmo_log_manager_insert(handle, kUri, nullptr, nullptr, nullptr), BRELMO_LOG_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(brelmo_log_manager_insert(handle, nullptr, b, nullptr, nullptr),
+            BRELMO_LOG_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(brelmo_log_manager_insert(nullptr, kUri, b, nullptr, nullptr),
+            BRELMO_LOG_ERROR_INVALID_PARAMETER);
+  EXPECT_EQ(brelmo_log_manager_insert(handle, kUri, nullptr, nullptr, nullptr),
+            BRELMO_LOG_ERROR_INVALID_PARAMETER);
   bundle_free(b);
   brelmo_log_manager_destroy(handle);
 

@@ -8,6 +8,7 @@
 #include <cstring>
 #include <string>
 
+#include "app-assist/WWindowController.h"
 #include "codec/Bitmap.h"
 #include "common/CLyUtil.h"
 #include "control/CLyGesture.h"
@@ -54,7 +55,11 @@ CollageHost::CollageHost(const HostOptions& options) {
   CLyMultiGridStyleManager& styles = CLyMultiGridStyleManager::getInstance();
   if (styles.getGridLayoutCount(options.photos) <= 0) styles.initialize();
 
-  mWin = createTestWindow(options.width, options.height);
+  // Controls find their window through its controller.
+  auto* window = new app_assist::WWindowController("pictavo-touch-test");
+  if (!window->create()) return;
+  mWin = window->getEvasObj();
+  evas_object_resize(mWin, options.width, options.height);
   mList = new CLyMultiGridDrawRectList;
   mItems = new CLyMultiGridSrcItemList;
   for (int i = 0; i < options.photos; ++i) {
