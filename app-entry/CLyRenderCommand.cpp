@@ -3,6 +3,7 @@
 #include <Elementary.h>
 
 #include <cerrno>
+#include <chrono>
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
@@ -14,17 +15,40 @@
 
 #include "app-assist/WWindowController.h"
 #include "codec/Bitmap.h"
+#include "common/CLyAppData.h"
 #include "common/CLyLog.h"
 #include "control/CLyMultiGrid.h"
 #include "control/CLyMultiGridSaver.h"
 #include "model/CLyImageDecoderThread.h"
-#include "model/ILyMultiGridListener.h"
 #include "model/CLyMultiGridDrawRectList.h"
 #include "model/CLyMultiGridSrcItem.h"
 #include "model/CLyMultiGridSrcItemList.h"
+#include "model/ILyMultiGridListener.h"
 #include "model/style/CLyMultiGridStyleManager.h"
 
 namespace {
+
+// PICTAVO_RENDER_TIMES=1 prints how long each step took, to stderr.
+class StepTimer {
+ public:
+  StepTimer() : mOn(getenv("PICTAVO_RENDER_TIMES") != nullptr), mLast(std::chrono::steady_clock::now()) {}
+  void mark(const char* step) {
+    if (!mOn) return;
+    auto now = std::chrono::steady_clock::now();
+    fprintf(stderr, "pictavo: %-8s %7.1f ms\n", step,
+            std::chrono::duration<double, std::milli>(now - mLast).count());
+    mLast = now;
+  }
+
+ private:
+  bool mOn;
+  std::chrono::steady_clock::time_point mLast;
+};
+
+StepTimer& stepTimer() {
+  static StepTimer timer;
+  return timer;
+}
 
 const int kMinPhotos = 2;
 const int kMaxPhotos = 6;
@@ -170,27 +194,50 @@ class DecodeResults : public ILyMultiGridListener {
 };
 
 // Decodes every photo on its own thread, bounded by the screen size ordered
-// so that width <= height, like the main view.
-void decodePhotos(const Options& o, DecodeResults& results) {
-  const float maxW = (float)std::min(o.screenW, o.screenH), maxH = (float)std::max(o.screenW, o.screenH);
-  std::vector<std::unique_ptr<CLyImageDecoderThread>> threads;
-  for (size_t i = 0; i < o.photos.size(); i++) {
-    auto t = std::make_unique<CLyImageDecoderThread>();
-    t->setMaxDecodingSize(maxW, maxH);
-    t->set((int)i, o.photos[i], &results);
-    threads.push_back(std::move(t));
+// so that width <= height, like the main view. The threads run while the
+// main thread brings up the toolkit and reads the layouts.
+class PhotoDecoder {
+ public:
+  explicit PhotoDecoder(const Options& o) : mResults(o.photos.size()) {
+    const float maxW = (float)std::min(o.screenW, o.screenH), maxH = (float)std::max(o.screenW, o.screenH);
+    for (size_t i = 0; i < o.photos.size(); i++) {
+      auto t = std::make_unique<CLyImageDecoderThread>();
+      t->setMaxDecodingSize(maxW, maxH);
+      t->set((int)i, o.photos[i], &mResults);
+      mThreads.push_back(std::move(t));
+    }
+    for (auto& t : mThreads) t->start();
   }
-  for (auto& t : threads) t->start();
-  threads.clear();  // joins every thread
-}
+  ~PhotoDecoder() { join(); }
+  void join() { mThreads.clear(); }  // deleting a thread object joins it
+  DecodeResults& results() { return mResults; }
 
-int render(const Options& o) {
-  DecodeResults results(o.photos.size());
-  decodePhotos(o, results);
+ private:
+  DecodeResults mResults;
+  std::vector<std::unique_ptr<CLyImageDecoderThread>> mThreads;
+};
 
+int render(const Options& o, PhotoDecoder& decoder) {
+  CLyMultiGridStyleManager* styles = &CLyMultiGridStyleManager::getInstance();
+  if (styles->getGridLayoutCount(2) == 0 && !styles->initialize()) {
+    fprintf(stderr, "pictavo: the layout styles could not be read\n");
+    return LY_RENDER_FAILED;
+  }
+  stepTimer().mark("styles");
+  // A window controller on the buffer engine: the collage control lives in
+  // a window like in the application, but nothing is shown.
+  auto* window = new app_assist::WWindowController("pictavo-render");
+  if (!window->precreate()) {
+    fprintf(stderr, "pictavo: no canvas could be created\n");
+    return LY_RENDER_FAILED;
+  }
+  stepTimer().mark("window");
+
+  decoder.join();
+  stepTimer().mark("decode");
   CLyMultiGridSrcItemList items;
   for (size_t i = 0; i < o.photos.size(); i++) {
-    Bitmap* bitmap = results.take(i);
+    Bitmap* bitmap = decoder.results().take(i);
     if (!bitmap) {
       fprintf(stderr, "pictavo: skipping %s: not a photo that can be decoded\n", o.photos[i].c_str());
       continue;
@@ -198,71 +245,57 @@ int render(const Options& o) {
     CLyMultiGridSrcItem* item = new (std::nothrow) CLyMultiGridSrcItem();
     if (!item) {
       delete bitmap;
-      fprintf(stderr, "pictavo: out of memory\n");
-      return LY_RENDER_FAILED;
+      continue;
     }
     item->setPath(o.photos[i]);
     item->setBitmap(bitmap, true);
     items.add(item);
   }
   const int count = items.count();
+  int status = LY_RENDER_OK;
+  const int layouts = styles->getGridLayoutCount(count);
+  CLyMultiGridDrawRectList cells;
   if (count < kMinPhotos) {
     fprintf(stderr, "pictavo: a collage needs at least %d usable photos, %d could be decoded\n", kMinPhotos,
             count);
-    items.clear(true);
-    return LY_RENDER_NO_PHOTOS;
-  }
-
-  CLyMultiGridStyleManager* styles = &CLyMultiGridStyleManager::getInstance();
-  if (styles->getGridLayoutCount(count) == 0 && !styles->initialize()) {
-    fprintf(stderr, "pictavo: the layout styles could not be read\n");
-    items.clear(true);
-    return LY_RENDER_FAILED;
-  }
-  const int layouts = styles->getGridLayoutCount(count);
-  if (o.layout >= layouts) {
+    status = LY_RENDER_NO_PHOTOS;
+  } else if (o.layout >= layouts) {
     fprintf(stderr, "pictavo: %d photos have layouts 0 to %d, not %d\n", count, layouts - 1, o.layout);
-    items.clear(true);
-    return LY_RENDER_USAGE;
-  }
-  float rects[6][4] = {};
-  styles->getDrawRects(count, o.ratio, o.layout, rects);
-  CLyMultiGridDrawRectList cells;
-  for (int i = 0; i < count; i++)
-    cells.addItem(new CLyFloatRectangle(rects[i][0], rects[i][1], rects[i][2], rects[i][3]));
-  cells.setStyleIndex(o.layout);
+    status = LY_RENDER_USAGE;
+  } else {
+    float rects[6][4] = {};
+    styles->getDrawRects(count, o.ratio, o.layout, rects);
+    for (int i = 0; i < count; i++) {
+      auto* cell = new (std::nothrow) CLyFloatRectangle(rects[i][0], rects[i][1], rects[i][2], rects[i][3]);
+      if (!cell || !cells.addItem(cell)) delete cell;
+    }
+    cells.setStyleIndex(o.layout);
 
-  // A window controller on the buffer engine: the collage control lives in
-  // a window like in the application, but nothing is shown.
-  auto* window = new app_assist::WWindowController("pictavo-render");
-  if (!window->precreate()) {
-    fprintf(stderr, "pictavo: no canvas could be created\n");
-    cells.clear(true);
-    items.clear(true);
-    return LY_RENDER_FAILED;
+    CLyMultiGridSaveRequest request;
+    request.cells = &cells;
+    request.items = &items;
+    request.ratio = o.ratio;
+    request.margin = o.margin;
+    request.roundness = o.roundness;
+    request.background = o.background;
+    request.limit = kSaveLimit;
+    int w = 0, h = 0;
+    Evas_Object* parent = window->getBaseLayout() ? window->getBaseLayout() : window->getEvasObj();
+    if (CLyMultiGridSaver::save(window->getEvasObj(), parent, request, o.out, &w, &h)) {
+      char* real = realpath(o.out.c_str(), nullptr);
+      printf("Collage of %d photos (%d x %d) saved to %s\n", count, w, h, real ? real : o.out.c_str());
+      free(real);
+    } else {
+      fprintf(stderr, "pictavo: the collage could not be written to %s (PICTAVO_LOG_LEVEL=E shows why)\n",
+              o.out.c_str());
+      status = LY_RENDER_FAILED;
+    }
+    stepTimer().mark("save");
   }
-  CLyMultiGridSaveRequest request;
-  request.cells = &cells;
-  request.items = &items;
-  request.ratio = o.ratio;
-  request.margin = o.margin;
-  request.roundness = o.roundness;
-  request.background = o.background;
-  request.limit = kSaveLimit;
-  int w = 0, h = 0;
-  Evas_Object* parent = window->getBaseLayout() ? window->getBaseLayout() : window->getEvasObj();
-  const bool saved = CLyMultiGridSaver::save(window->getEvasObj(), parent, request, o.out, &w, &h);
   window->destroy();
   cells.clear(true);
   items.clear(true);
-  if (!saved) {
-    fprintf(stderr, "pictavo: the collage could not be written to %s (PICTAVO_LOG_LEVEL=E shows why)\n", o.out.c_str());
-    return LY_RENDER_FAILED;
-  }
-  char* real = realpath(o.out.c_str(), nullptr);
-  printf("Collage of %d photos (%d x %d) saved to %s\n", count, w, h, real ? real : o.out.c_str());
-  free(real);
-  return LY_RENDER_OK;
+  return status;
 }
 
 }  // namespace
@@ -279,11 +312,19 @@ int runRenderCommand(int argc, char** argv) {
   setenv("EINA_LOG_LEVEL", "0", 0);
   setenv("ECORE_NO_SYSTEM_MODULES", "1", 0);
   setenv("EINA_LOG_BACKTRACE", "-1", 0);
+  stepTimer().mark("args");
+  // The application data (with the lock around PNG decoding) exists before
+  // any decoder thread asks for it: its lazy creation is not thread-safe.
+  CLyAppData::getInstance();
+  // Decoding starts first: it is the longest step and needs no toolkit.
+  PhotoDecoder decoder(o);
   if (!elm_init(argc, argv)) {
     fprintf(stderr, "pictavo: the toolkit could not start\n");
     return LY_RENDER_FAILED;
   }
-  status = render(o);
+  stepTimer().mark("elm_init");
+  status = render(o, decoder);
+  decoder.join();
   elm_shutdown();
   return status;
 }

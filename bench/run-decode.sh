@@ -30,18 +30,26 @@ IN=$W/in; OUT=$W/out; mkdir -p "$IN" "$OUT"
 P12=("$IN"/p12_*.jpg)
 
 us() { local t=$EPOCHREALTIME; echo "${t/./}"; }
-stats() {
-  sort -g | awk -v n="$1" '{a[NR]=$1/1000} END {
-    m = (NR % 2) ? a[(NR+1)/2] : (a[NR/2] + a[NR/2+1]) / 2
-    printf "%s: %.1f %.1f %.1f (ms)\n", n, a[1], m, a[NR] }'
+# CPU time (user + sys) of all finished children so far, in microseconds.
+cpu_us() {
+  times | awk 'NR == 2 { t = 0; for (i = 1; i <= 2; i++) { split($i, p, /[ms]/); t += p[1] * 60 + p[2] }
+                         printf "%d\n", t * 1e6 }'
 }
+stats() {
+  sort -g | awk -v n="$1" -v u="${2:-ms}" '{a[NR]=$1/1000} END {
+    m = (NR % 2) ? a[(NR+1)/2] : (a[NR/2] + a[NR/2+1]) / 2
+    printf "%s: %.1f %.1f %.1f (%s)\n", n, a[1], m, a[NR], u }'
+}
+# bench NAME CMD...: whole-process wall time, and the CPU time the command's processes used.
 bench() {
-  local name=$1 i t0 t1; shift; local ts=()
+  local name=$1 i t0 t1 c0 c1; shift; local ts=() cs=()
   for ((i = 0; i < WARMUP; i++)); do "$@" >/dev/null; done
   for ((i = 0; i < RUNS; i++)); do
-    t0=$(us); "$@" >/dev/null; t1=$(us); ts+=($((t1 - t0)))
+    c0=$(cpu_us); t0=$(us); "$@" >/dev/null; t1=$(us); c1=$(cpu_us)
+    ts+=($((t1 - t0))); cs+=($((c1 - c0)))
   done
-  printf '%s\n' "${ts[@]}" | stats "$name"
+  printf '%s\n' "${ts[@]}" | stats "$name" ms
+  printf '%s\n' "${cs[@]}" | stats "$name" "ms cpu"
 }
 ratio() {
   local name=$1 a=$2 b=$3 i t0 t1 t2; local rs=()

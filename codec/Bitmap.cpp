@@ -2,7 +2,9 @@
 
 #include <cstdlib>
 
-Bitmap::~Bitmap() { free(mPixels); }
+Bitmap::~Bitmap() {
+  free(mPixels);
+}
 
 int Bitmap::bytesPerPixel(int format) {
   switch (format) {
@@ -36,7 +38,9 @@ int Bitmap::getStride() const {
   return mWidth * bytesPerPixel(mFormat);
 }
 
-size_t Bitmap::getByteSize() const { return bufferSize(mWidth, mHeight, mFormat); }
+size_t Bitmap::getByteSize() const {
+  return bufferSize(mWidth, mHeight, mFormat);
+}
 
 void Bitmap::adopt(unsigned char* pixels, int width, int height, int format) {
   if (pixels != mPixels) free(mPixels);

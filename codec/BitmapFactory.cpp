@@ -135,8 +135,8 @@ int parseImage(const std::string& path, DecodeOptions& options) {
 }
 
 bool isSupportedType(int type) {
-  return type == IMAGE_TYPE_JPEG || type == IMAGE_TYPE_BMP || type == IMAGE_TYPE_GIF || type == IMAGE_TYPE_WBMP ||
-         type == IMAGE_TYPE_GIF2;
+  return type == IMAGE_TYPE_JPEG || type == IMAGE_TYPE_BMP || type == IMAGE_TYPE_GIF ||
+         type == IMAGE_TYPE_WBMP || type == IMAGE_TYPE_GIF2;
 }
 
 Bitmap* decodeFile(const std::string& path, DecodeOptions& options, int width, int height, int /*flag*/) {

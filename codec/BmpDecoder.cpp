@@ -20,8 +20,12 @@ namespace {
 
 enum { kRgb = 0, kRle8 = 1, kRle4 = 2, kBitfields = 3, kAlphaBitfields = 6 };
 
-uint32_t le32(const uint8_t* p) { return p[0] | (p[1] << 8) | (p[2] << 16) | (static_cast<uint32_t>(p[3]) << 24); }
-uint16_t le16(const uint8_t* p) { return static_cast<uint16_t>(p[0] | (p[1] << 8)); }
+uint32_t le32(const uint8_t* p) {
+  return p[0] | (p[1] << 8) | (p[2] << 16) | (static_cast<uint32_t>(p[3]) << 24);
+}
+uint16_t le16(const uint8_t* p) {
+  return static_cast<uint16_t>(p[0] | (p[1] << 8));
+}
 
 struct BmpInfo {
   uint32_t dataOffset = 0;
@@ -73,8 +77,9 @@ bool readInfo(FILE* file, BmpInfo& info, bool withPalette) {
       return false;
   }
   const int c = info.compression;
-  const bool okCompression = (c == kRgb) || (c == kRle8 && info.bpp == 8) || (c == kRle4 && info.bpp == 4) ||
-                             ((c == kBitfields || c == kAlphaBitfields) && (info.bpp == 16 || info.bpp == 32));
+  const bool okCompression =
+      (c == kRgb) || (c == kRle8 && info.bpp == 8) || (c == kRle4 && info.bpp == 4) ||
+      ((c == kBitfields || c == kAlphaBitfields) && (info.bpp == 16 || info.bpp == 32));
   if (!okCompression || ((c == kRle8 || c == kRle4) && info.topDown)) {
     IVLOG_E("compression %d with %d bits per pixel not supported", c, info.bpp);
     return false;
@@ -244,7 +249,8 @@ bool decodeRle(FILE* file, const BmpInfo& info, RowWriter& writer, std::vector<u
       const int bytes = four ? (value + 1) / 2 : value;
       uint8_t literal[256];
       if (fread(literal, 1, static_cast<size_t>(bytes), file) != static_cast<size_t>(bytes)) break;
-      for (int i = 0; i < value && x < w; ++i) put(four ? ((i & 1) ? literal[i / 2] & 15 : literal[i / 2] >> 4) : literal[i]);
+      for (int i = 0; i < value && x < w; ++i)
+        put(four ? ((i & 1) ? literal[i / 2] & 15 : literal[i / 2] >> 4) : literal[i]);
       if (bytes & 1) getc(file);  // literal runs are padded to 16 bits
     }
   }

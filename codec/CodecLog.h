@@ -8,7 +8,7 @@
 #define IV_LOG_TAG "IV-COMMON"
 #define IV_FILE_NAME (__builtin_strrchr(__FILE__, '/') ? __builtin_strrchr(__FILE__, '/') + 1 : __FILE__)
 
-#define IV_LOG_AT(prio, fmt, ...)                                                                    \
+#define IV_LOG_AT(prio, fmt, ...)                                                                       \
   dlog_print(prio, IV_LOG_TAG, "%s: %s(%d) > [F:%s\tL:%d] %s : " fmt, IV_FILE_NAME, __func__, __LINE__, \
              IV_FILE_NAME, __LINE__, __func__, ##__VA_ARGS__)
 

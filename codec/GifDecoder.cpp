@@ -134,7 +134,8 @@ bool decodeGif(FILE* file, int outW, int outH, uint8_t* out) {
 
   auto pushScreenRow = [&](const GifByteType* indexes) {
     std::fill(row.begin(), row.end(), 0);
-    if (indexes && visW > 0) paletteRow(indexes, visW, map, transparent, row.data() + static_cast<size_t>(visX0) * 4);
+    if (indexes && visW > 0)
+      paletteRow(indexes, visW, map, transparent, row.data() + static_cast<size_t>(visX0) * 4);
     resampler.pushRow(row.data());
   };
 

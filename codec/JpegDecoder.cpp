@@ -140,7 +140,8 @@ bool decodeJpeg(FILE* file, int outW, int outH, uint8_t* out) {
     for (unsigned m = 1; m <= 8; ++m) {
       cinfo.scale_num = m;
       jpeg_calc_output_dimensions(&cinfo);
-      if (cinfo.output_width >= static_cast<unsigned>(outW) && cinfo.output_height >= static_cast<unsigned>(outH))
+      if (cinfo.output_width >= static_cast<unsigned>(outW) &&
+          cinfo.output_height >= static_cast<unsigned>(outH))
         break;
     }
     jpeg_start_decompress(&cinfo);

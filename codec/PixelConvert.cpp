@@ -24,7 +24,9 @@ namespace {
 inline uint8_t unpremultiply(unsigned v, unsigned a) {
   return a == 0 ? 0 : static_cast<uint8_t>(std::min(255u, (v * 255 + a / 2) / a));
 }
-inline int clampByte(int v) { return v < 0 ? 0 : (v > 255 ? 255 : v); }
+inline int clampByte(int v) {
+  return v < 0 ? 0 : (v > 255 ? 255 : v);
+}
 }  // namespace
 
 void convertFromBgra(const uint8_t* src, int width, int height, int format, uint8_t* dst) {

@@ -27,7 +27,9 @@ void pngError(png_structp png, png_const_charp message) {
   png_longjmp(png, 1);
 }
 
-void pngWarning(png_structp, png_const_charp message) { IVLOG_D("libpng: %s", message); }
+void pngWarning(png_structp, png_const_charp message) {
+  IVLOG_D("libpng: %s", message);
+}
 }  // namespace
 
 // The open PNG decoder between initPNGFile and decodePNG; closes itself.
@@ -83,7 +85,8 @@ bool openPng(PngReader& r, FILE* file, bool transforms) {
   if (!(colorType & PNG_COLOR_MASK_COLOR)) png_set_gray_to_rgb(r.png);
   png_set_bgr(r.png);
   if (!r.hasAlpha) png_set_filler(r.png, 0xff, PNG_FILLER_AFTER);
-  if (r.interlaced && static_cast<long long>(w) * h <= kMaxWholeInterlacedPixels) png_set_interlace_handling(r.png);
+  if (r.interlaced && static_cast<long long>(w) * h <= kMaxWholeInterlacedPixels)
+    png_set_interlace_handling(r.png);
   png_read_update_info(r.png, r.info);
   if (png_get_rowbytes(r.png, r.info) != static_cast<size_t>(r.width) * 4) {
     IVLOG_E("unexpected row size %zu for width %d", png_get_rowbytes(r.png, r.info), r.width);

@@ -5,6 +5,10 @@
 #include <cstring>
 #include <new>
 
+#ifdef __SSE2__
+#include <emmintrin.h>
+#endif
+
 #include "codec/CodecLog.h"
 
 namespace BitmapFactory {
@@ -84,6 +88,43 @@ void Resampler::buildTaps(Taps& taps, int in, int out) {
 
 void Resampler::horizontal(const uint8_t* row, uint16_t* dst) const {
   const int16_t* weights = mHTaps.weight.data();
+  constexpr int kShift = kWeightBits - 8, kHalf = 1 << (kShift - 1);
+#ifdef __SSE2__
+  // Two neighbouring source pixels at a time: their channels interleaved as
+  // 16-bit pairs, multiplied by the pair of weights and summed in one step.
+  const __m128i zero = _mm_setzero_si128();
+  const __m128i half = _mm_set1_epi32(kHalf);
+  for (int x = 0; x < mOutW; ++x, dst += 4) {
+    const int16_t* w = weights + mHTaps.offset[x];
+    const uint8_t* p = row + static_cast<size_t>(mHTaps.start[x]) * 4;
+    const int n = mHTaps.count[x];
+    __m128i acc = _mm_setzero_si128();
+    int k = 0;
+    for (; k + 1 < n; k += 2, p += 8) {
+      int32_t a, b;
+      memcpy(&a, p, 4);
+      memcpy(&b, p + 4, 4);
+      const __m128i pa = _mm_unpacklo_epi8(_mm_cvtsi32_si128(a), zero);
+      const __m128i pb = _mm_unpacklo_epi8(_mm_cvtsi32_si128(b), zero);
+      const __m128i pair = _mm_unpacklo_epi16(pa, pb);
+      const __m128i wpair = _mm_set1_epi32(static_cast<int32_t>(
+          (static_cast<uint32_t>(static_cast<uint16_t>(w[k + 1])) << 16) | static_cast<uint16_t>(w[k])));
+      acc = _mm_add_epi32(acc, _mm_madd_epi16(pair, wpair));
+    }
+    if (k < n) {
+      int32_t a;
+      memcpy(&a, p, 4);
+      const __m128i pa = _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(a), zero), zero);
+      acc = _mm_add_epi32(acc, _mm_madd_epi16(pa, _mm_set1_epi32(static_cast<uint16_t>(w[k]))));
+    }
+    acc = _mm_srai_epi32(_mm_add_epi32(acc, half), kShift);
+    // Values fit 16 bits unsigned (at most 255 x 256); pack through signed
+    // saturation safely by offsetting.
+    acc = _mm_sub_epi32(acc, _mm_set1_epi32(32768));
+    const __m128i packed = _mm_add_epi16(_mm_packs_epi32(acc, acc), _mm_set1_epi16(-32768));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(dst), packed);
+  }
+#else
   for (int x = 0; x < mOutW; ++x, dst += 4) {
     const int16_t* w = weights + mHTaps.offset[x];
     const uint8_t* p = row + static_cast<size_t>(mHTaps.start[x]) * 4;
@@ -94,12 +135,12 @@ void Resampler::horizontal(const uint8_t* row, uint16_t* dst) const {
       r += w[k] * p[2];
       a += w[k] * p[3];
     }
-    constexpr int kShift = kWeightBits - 8, kHalf = 1 << (kShift - 1);
     dst[0] = static_cast<uint16_t>((b + kHalf) >> kShift);
     dst[1] = static_cast<uint16_t>((g + kHalf) >> kShift);
     dst[2] = static_cast<uint16_t>((r + kHalf) >> kShift);
     dst[3] = static_cast<uint16_t>((a + kHalf) >> kShift);
   }
+#endif
 }
 
 void Resampler::pushRow(const uint8_t* row) {
@@ -132,7 +173,8 @@ void Resampler::pushRow(const uint8_t* row) {
   while (mEmitted < mOutH && mVTaps.start[mEmitted] + mVTaps.count[mEmitted] <= mPushed) {
     storeRow(mEmitted, mAcc.data());
     ++mEmitted;
-    std::copy(mAcc.begin() + rowLen, mAcc.end(), mAcc.begin());
+    // The next row's partial sum moves to the front; the back starts over.
+    std::swap_ranges(mAcc.begin(), mAcc.begin() + rowLen, mAcc.begin() + rowLen);
     std::fill(mAcc.begin() + rowLen, mAcc.end(), 0);
   }
 }
@@ -158,17 +200,15 @@ void Resampler::emitRow(int y) {
   storeRow(y, acc);
 }
 
-// Sums are levels x 256 x (1 << 14): back to bytes, colour never above alpha.
+// Sums are levels x 256 x (1 << 14) of non-negative weights adding up to
+// one, so they come back to bytes without clamping, and a premultiplied
+// colour stays at or below its alpha.
 void Resampler::storeRow(int y, const int32_t* acc) {
   const int outY = mBottomUp ? mOutH - 1 - y : y;
   uint8_t* dst = mOut + static_cast<size_t>(outY) * mOutW * 4;
   const size_t rowLen = static_cast<size_t>(mOutW) * 4;
   constexpr int kShift = kWeightBits + 8, kHalf = 1 << (kShift - 1);
-  for (size_t i = 0; i < rowLen; i += 4) {
-    const int a = std::min(255, std::max(0, (acc[i + 3] + kHalf) >> kShift));
-    for (int c = 0; c < 3; ++c) dst[i + c] = static_cast<uint8_t>(std::min(a, std::max(0, (acc[i + c] + kHalf) >> kShift)));
-    dst[i + 3] = static_cast<uint8_t>(a);
-  }
+  for (size_t i = 0; i < rowLen; ++i) dst[i] = static_cast<uint8_t>((acc[i] + kHalf) >> kShift);
 }
 
 void Resampler::finish() {

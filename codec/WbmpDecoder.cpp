@@ -34,7 +34,9 @@ bool readHeader(FILE* file, long long& width, long long& height) {
 
 }  // namespace
 
-bool readWbmpSize(FILE* file, long long& width, long long& height) { return readHeader(file, width, height); }
+bool readWbmpSize(FILE* file, long long& width, long long& height) {
+  return readHeader(file, width, height);
+}
 
 bool decodeWbmp(FILE* file, int outW, int outH, uint8_t* out) {
   long long width = 0, height = 0;

@@ -175,11 +175,18 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
 
   // The box's objects stay with the collage's other members, so they move,
   // clip and die with it; a plain swallow is not a smart object.
+  // (Elementary widgets answer no classic smart class, but they have members.)
+  auto isSmart = [](Evas_Object* obj) {
+    Eina_List* members = obj ? evas_object_smart_members_get(obj) : nullptr;
+    const bool smart = members != nullptr || (obj && evas_object_smart_smart_get(obj));
+    eina_list_free(members);
+    return smart;
+  };
   Evas_Object* smartParent = nullptr;
-  if (evas_object_smart_smart_get(parent))
+  if (isSmart(parent))
     smartParent = parent;
   else if (swallow)
-    smartParent = evas_object_smart_smart_get(swallow) ? swallow : evas_object_smart_parent_get(swallow);
+    smartParent = isSmart(swallow) ? swallow : evas_object_smart_parent_get(swallow);
 
   Evas* evas = evas_object_evas_get(parent);
   Evas_Object* image = evas_object_image_filled_add(evas);

@@ -789,37 +789,53 @@ bool CLyMultiGrid::save(const std::string& path) {
     return false;
   }
   const CLyRectangle roi = *_pImpl->bgDrawRoi;
-  Evas_Object* image = evas_object_image_filled_add(evas_object_evas_get(_pImpl->canvasImage));
-  if (!image) return false;
-  evas_object_image_colorspace_set(image, EVAS_COLORSPACE_ARGB8888);
-  evas_object_image_alpha_set(image, EINA_FALSE);
-  CLyCairoCanvas* canvas = new (std::nothrow) CLyCairoCanvas(image, roi, false);
-  if (!canvas || !canvas->isValid()) {
-    LYLOG_E("Failed to add canvas");
-    delete canvas;
-    evas_object_del(image);
-    return false;
-  }
-  const CLyFloatRectangle area((float)roi.x, (float)roi.y, (float)roi.w, (float)roi.h);
   const CLyRectangle& c = _pImpl->bgColor;
-  canvas->fillRect(CLyFloatRectangle(c.x / 255.0f, c.y / 255.0f, c.w / 255.0f, c.h / 255.0f), area);
-  // The drawn collage over the background: its transparent gaps show the
-  // colour. The collage pixels are read in place rather than copied.
+  const CLyFloatRectangle color(c.x / 255.0f, c.y / 255.0f, c.w / 255.0f, c.h / 255.0f);
   LYLOG_D("size: %d", roi.w * roi.h * 4);
-  cairo_surface_t* drawn = _pImpl->canvas->getSurface();
-  cairo_surface_flush(drawn);
-  canvas->setFilter(CAIRO_FILTER_NEAREST);  // same size: a straight copy
-  canvas->beginPath();
-  canvas->setRectPath(area);
-  canvas->drawBitmap(drawn, area, CLyRectangle(0, 0, roi.w, roi.h));
-  canvas->update();
-  delete canvas;
+  Evas_Object* image = nullptr;
+  if (_pImpl->saveMode) {
+    // The hidden save control's canvas is drawn for this save only: the
+    // background goes under the collage in place, no second 4-byte buffer.
+    cairo_t* cr = _pImpl->canvas->getContext();
+    cairo_save(cr);
+    cairo_set_operator(cr, CAIRO_OPERATOR_DEST_OVER);
+    cairo_set_source_rgba(cr, color.x1, color.y1, color.x2, color.y2);
+    cairo_paint(cr);
+    cairo_restore(cr);
+    _pImpl->canvas->update();
+  } else {
+    // On screen the picture must stay as it is: compose into a new object.
+    image = evas_object_image_filled_add(evas_object_evas_get(_pImpl->canvasImage));
+    if (!image) return false;
+    evas_object_image_colorspace_set(image, EVAS_COLORSPACE_ARGB8888);
+    evas_object_image_alpha_set(image, EINA_FALSE);
+    CLyCairoCanvas* canvas = new (std::nothrow) CLyCairoCanvas(image, roi, false);
+    if (!canvas || !canvas->isValid()) {
+      LYLOG_E("Failed to add canvas");
+      delete canvas;
+      evas_object_del(image);
+      return false;
+    }
+    const CLyFloatRectangle area((float)roi.x, (float)roi.y, (float)roi.w, (float)roi.h);
+    canvas->fillRect(color, area);
+    // The drawn collage over the background: its transparent gaps show the
+    // colour. The collage pixels are read in place rather than copied.
+    cairo_surface_t* drawn = _pImpl->canvas->getSurface();
+    cairo_surface_flush(drawn);
+    canvas->setFilter(CAIRO_FILTER_NEAREST);  // same size: a straight copy
+    canvas->beginPath();
+    canvas->setRectPath(area);
+    canvas->drawBitmap(drawn, area, CLyRectangle(0, 0, roi.w, roi.h));
+    canvas->update();
+    delete canvas;
+  }
 
   // Written under a temporary name next to the target and renamed only when
   // complete, so a failure never leaves a partial file under the real name.
   const std::string temporary = temporaryPathFor(path);
-  Eina_Bool written = evas_object_image_save(image, temporary.c_str(), nullptr, nullptr);
-  evas_object_del(image);
+  Eina_Bool written =
+      evas_object_image_save(image ? image : _pImpl->canvasImage, temporary.c_str(), nullptr, nullptr);
+  if (image) evas_object_del(image);
   if (!written || !isCompleteJpeg(temporary.c_str())) {
     LYLOG_E("evas_object_image_save failed");
     unlink(temporary.c_str());

@@ -40,9 +40,12 @@ ObjectRecord* findRecord(Evas_Object* obj) {
   return nullptr;
 }
 
+// Shown on screen: the object and every clipper above it are visible (a
+// hidden container hides its members through its clipper).
 bool reallyVisible(Evas_Object* obj) {
-  for (Evas_Object* o = obj; o; o = evas_object_smart_parent_get(o))
-    if (!evas_object_visible_get(o)) return false;
+  if (!evas_object_visible_get(obj)) return false;
+  for (Evas_Object* clip = evas_object_clip_get(obj); clip; clip = evas_object_clip_get(clip))
+    if (!evas_object_visible_get(clip)) return false;
   return true;
 }
 
@@ -57,6 +60,15 @@ void dispatch(Evas* evas, Eext_Callback_Type type) {
     if (evas_object_evas_get(record->obj) != evas || !hasType(record, type) || !reallyVisible(record->obj))
       continue;
     if (!target || record->stamp > target->stamp) target = record;
+  }
+  for (ObjectRecord* record : gRecords)
+    LYLOG_E("DBG rec %p same=%d type=%d vis=%d stamp=%lu", record->obj, evas_object_evas_get(record->obj) == evas,
+            hasType(record, type), reallyVisible(record->obj), (unsigned long)record->stamp);
+  for (ObjectRecord* record : gRecords) {
+    for (Evas_Object* o = record->obj; o; o = evas_object_clip_get(o))
+      LYLOG_E("DBG clip %p %s vis=%d", o, evas_object_type_get(o), evas_object_visible_get(o));
+    for (Evas_Object* o = record->obj; o; o = evas_object_smart_parent_get(o))
+      LYLOG_E("DBG parent %p %s vis=%d", o, evas_object_type_get(o), evas_object_visible_get(o));
   }
   if (!target) return;
   Evas_Object* obj = target->obj;
@@ -83,6 +95,7 @@ bool matches(const char* key, const char* const* names, size_t count) {
 void onKeyDown(void*, Evas* evas, Evas_Object*, void* event_info) {
   auto* ev = static_cast<Evas_Event_Key_Down*>(event_info);
   if (!ev || !ev->keyname) return;
+  LYLOG_E("DBG key %s records=%zu", ev->keyname, gRecords.size());
   if (matches(ev->keyname, kBackKeys, 2))
     dispatch(evas, EEXT_CALLBACK_BACK);
   else if (matches(ev->keyname, kMoreKeys, 2))

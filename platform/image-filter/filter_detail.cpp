@@ -33,12 +33,10 @@ void lookSharpen(const Frame& f) {
       const uint8_t* b = blur.row(y);
       for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
         const int k = boost[l[x] - b[x] + 255];
-        const int r = s[c.r], g = s[c.g], bl = s[c.b];
-        const uint8_t a = s[c.a];
-        d[c.r] = (uint8_t)clamp255(r + k);
-        d[c.g] = (uint8_t)clamp255(g + k);
-        d[c.b] = (uint8_t)clamp255(bl + k);
-        d[c.a] = a;
+        const uint32_t px = load32(s);
+        const int r = chan(px, c.r), g = chan(px, c.g), bl = chan(px, c.b);
+        store32(d, put((uint8_t)clamp255(r + k), c.r) | put((uint8_t)clamp255(g + k), c.g) |
+                       put((uint8_t)clamp255(bl + k), c.b) | (px & put(255, c.a)));
       }
     }
   });
@@ -120,11 +118,10 @@ void lookCartoon(const Frame& f) {
         g = clamp255(nl + (((g - nl) * 310) >> 8));
         b = clamp255(nl + (((b - nl) * 310) >> 8));
         const int ink = e[x];
-        const uint8_t a = s[c.a];
-        d[c.r] = (uint8_t)((r * (255 - ink) + kInk * ink) / 255);
-        d[c.g] = (uint8_t)((g * (255 - ink) + kInk * ink) / 255);
-        d[c.b] = (uint8_t)((b * (255 - ink) + kInk * ink) / 255);
-        d[c.a] = a;
+        const uint32_t px = load32(s);
+        store32(d, put((uint8_t)((r * (255 - ink) + kInk * ink) / 255), c.r) |
+                       put((uint8_t)((g * (255 - ink) + kInk * ink) / 255), c.g) |
+                       put((uint8_t)((b * (255 - ink) + kInk * ink) / 255), c.b) | (px & put(255, c.a)));
       }
     }
   });

@@ -1,6 +1,16 @@
 #include "platform/image-filter/filter_frame.h"
 
+#include <cstdlib>
+
 namespace imgfilter {
+
+bool simdAvx2() {
+#if defined(__x86_64__)
+  return __builtin_cpu_supports("avx2") && !getenv("PICTAVO_FILTER_NO_SIMD");
+#else
+  return false;
+#endif
+}
 
 GrainTile::GrainTile(uint64_t seed, int amp) : mTile(256 * 256) {
   Rng rng(seed);

@@ -4,6 +4,7 @@
 
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 #include <vector>
 
 namespace imgfilter {
@@ -49,6 +50,22 @@ struct Frame {
   int shortSide() const { return width < height ? width : height; }
 };
 
+// Whole-pixel access: one load and one store per pixel, channels by shift.
+inline uint32_t load32(const uint8_t* p) {
+  uint32_t v;
+  std::memcpy(&v, p, 4);
+  return v;
+}
+inline void store32(uint8_t* p, uint32_t v) {
+  std::memcpy(p, &v, 4);
+}
+constexpr int chan(uint32_t px, int byteIndex) {
+  return (int)((px >> (8 * byteIndex)) & 255u);
+}
+constexpr uint32_t put(int v, int byteIndex) {
+  return (uint32_t)v << (8 * byteIndex);
+}
+
 inline int clamp255(int v) {
   return v < 0 ? 0 : (v > 255 ? 255 : v);
 }
@@ -64,6 +81,11 @@ inline double smooth01(double t) {
 inline int luma709(int r, int g, int b) {
   return (54 * r + 183 * g + 19 * b) >> 8;
 }
+
+// True when the AVX2 kernels may run: the processor has AVX2 and
+// PICTAVO_FILTER_NO_SIMD is not set (tests compare both paths, which must
+// give the same bytes).
+bool simdAvx2();
 
 // Small, fast, seeded generator: every look that needs randomness seeds its
 // own, so results never depend on threads or on earlier calls.

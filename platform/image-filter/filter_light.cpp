@@ -135,12 +135,11 @@ void lookLightFlare(const Frame& f) {
       uint8_t* d = f.dstRow(y);
       for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
         const size_t i = (size_t)std::min<int64_t>(4095, (dy2 + dx2[(size_t)x]) >> shift);
-        const int r = s[c.r], g = s[c.g], b = s[c.b];
-        const uint8_t a = s[c.a];
-        d[c.r] = (uint8_t)(r + (g0[i] * (255 - r) + 127) / 255);
-        d[c.g] = (uint8_t)(g + (g1[i] * (255 - g) + 127) / 255);
-        d[c.b] = (uint8_t)(b + (g2[i] * (255 - b) + 127) / 255);
-        d[c.a] = a;
+        const uint32_t px = load32(s);
+        const int r = chan(px, c.r), g = chan(px, c.g), b = chan(px, c.b);
+        store32(d, put((uint8_t)(r + (g0[i] * (255 - r) + 127) / 255), c.r) |
+                       put((uint8_t)(g + (g1[i] * (255 - g) + 127) / 255), c.g) |
+                       put((uint8_t)(b + (g2[i] * (255 - b) + 127) / 255), c.b) | (px & put(255, c.a)));
       }
     }
     // Ghosts: position along the axis, radius (of the short side), colour, strength.

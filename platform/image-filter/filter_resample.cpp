@@ -3,6 +3,10 @@
 #include <algorithm>
 #include <cmath>
 
+#if defined(__x86_64__)
+#include <immintrin.h>
+#endif
+
 namespace imgfilter {
 
 int reductionFor(int shortSide, int target) {
@@ -166,15 +170,50 @@ void boxBlur(Image<N>& img, int radius, int passes) {
   }
 }
 
+namespace {
+
+// out[k] = (a[k] * (256 - w) + b[k] * w + 32768) >> 16, for 8.8 inputs.
+void blendRows(const uint16_t* a, const uint16_t* b, uint32_t w, uint8_t* out, size_t n, size_t from) {
+  for (size_t k = from; k < n; ++k) out[k] = (uint8_t)((a[k] * (256u - w) + b[k] * w + 32768u) >> 16);
+}
+
+#if defined(__x86_64__)
+__attribute__((target("avx2"))) size_t blendRowsAvx2(const uint16_t* a, const uint16_t* b, uint32_t w,
+                                                     uint8_t* out, size_t n) {
+  const __m256i wa = _mm256_set1_epi32((int)(256u - w)), wb = _mm256_set1_epi32((int)w);
+  const __m256i round = _mm256_set1_epi32(32768);
+  size_t k = 0;
+  for (; k + 16 <= n; k += 16) {
+    const __m256i va = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(a + k));
+    const __m256i vb = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(b + k));
+    const __m256i a0 = _mm256_cvtepu16_epi32(_mm256_castsi256_si128(va));
+    const __m256i a1 = _mm256_cvtepu16_epi32(_mm256_extracti128_si256(va, 1));
+    const __m256i b0 = _mm256_cvtepu16_epi32(_mm256_castsi256_si128(vb));
+    const __m256i b1 = _mm256_cvtepu16_epi32(_mm256_extracti128_si256(vb, 1));
+    __m256i r0 = _mm256_add_epi32(_mm256_mullo_epi32(a0, wa), _mm256_mullo_epi32(b0, wb));
+    __m256i r1 = _mm256_add_epi32(_mm256_mullo_epi32(a1, wa), _mm256_mullo_epi32(b1, wb));
+    r0 = _mm256_srli_epi32(_mm256_add_epi32(r0, round), 16);
+    r1 = _mm256_srli_epi32(_mm256_add_epi32(r1, round), 16);
+    // 16 values 0..255: pack to 16-bit, then to bytes, fixing the lane order.
+    const __m256i p16 = _mm256_permute4x64_epi64(_mm256_packus_epi32(r0, r1), 0xD8);
+    const __m128i p8 = _mm_packus_epi16(_mm256_castsi256_si128(p16), _mm256_extracti128_si256(p16, 1));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out + k), p8);
+  }
+  return k;
+}
+#endif
+
+}  // namespace
+
 template <int N>
-Upsampler<N>::Upsampler(const Image<N>& small, int factor, int fullWidth, int fullHeight)
+Upsampler<N>::Upsampler(const Image<N>& small, int factor, int fullWidth, int)
     : mSmall(small),
       mFactor(factor),
       mWidth(fullWidth),
-      mHeight(fullHeight),
       mX0((size_t)fullWidth),
       mWx((size_t)fullWidth),
-      mTmp((size_t)small.w * N),
+      mWide0((size_t)fullWidth * N),
+      mWide1((size_t)fullWidth * N),
       mOut((size_t)fullWidth * N) {
   for (int x = 0; x < fullWidth; ++x) {
     double u = (x + 0.5) / factor - 0.5;
@@ -186,26 +225,47 @@ Upsampler<N>::Upsampler(const Image<N>& small, int factor, int fullWidth, int fu
 }
 
 template <int N>
-const uint8_t* Upsampler<N>::row(int y) {
-  if (mFactor == 1) return mSmall.row(std::clamp(y, 0, mSmall.h - 1));
-  double v = std::clamp((y + 0.5) / mFactor - 0.5, 0.0, (double)(mSmall.h - 1));
-  const int y0 = std::min((int)v, mSmall.h - 1), y1 = std::min(y0 + 1, mSmall.h - 1);
-  const uint32_t wy = (uint32_t)std::lround((v - y0) * 256.0);
-  const uint8_t* a = mSmall.row(y0);
-  const uint8_t* b = mSmall.row(y1);
-  for (size_t k = 0; k < mTmp.size(); ++k) mTmp[k] = (uint16_t)(a[k] * (256u - wy) + b[k] * wy);
+void Upsampler<N>::widen(int sy, uint16_t* out) const {
+  const uint8_t* s = mSmall.row(sy);
   const int lastX = mSmall.w - 1;
-  uint8_t* out = mOut.data();
   for (int x = 0; x < mWidth; ++x) {
     const int x0 = mX0[(size_t)x];
     const int x1 = x0 < lastX ? x0 + 1 : x0;
     const uint32_t wx = mWx[(size_t)x];
-    const uint16_t* p = &mTmp[(size_t)x0 * N];
-    const uint16_t* q = &mTmp[(size_t)x1 * N];
-    for (int k = 0; k < N; ++k)
-      out[(size_t)x * N + k] = (uint8_t)((p[k] * (256u - wx) + q[k] * wx + 32768u) >> 16);
+    const uint8_t* p = s + (size_t)x0 * N;
+    const uint8_t* q = s + (size_t)x1 * N;
+    for (int k = 0; k < N; ++k) out[(size_t)x * N + k] = (uint16_t)(p[k] * (256u - wx) + q[k] * wx);
   }
-  return out;
+}
+
+template <int N>
+const uint8_t* Upsampler<N>::row(int y) {
+  if (mFactor == 1) return mSmall.row(std::clamp(y, 0, mSmall.h - 1));
+  const double v = std::clamp((y + 0.5) / mFactor - 0.5, 0.0, (double)(mSmall.h - 1));
+  const int y0 = std::min((int)v, mSmall.h - 1), y1 = std::min(y0 + 1, mSmall.h - 1);
+  const uint32_t wy = (uint32_t)std::lround((v - y0) * 256.0);
+  // Rows are asked for in order, so the widened rows move down one at a time.
+  if (y0 != mRow0) {
+    if (y0 == mRow1) {
+      std::swap(mWide0, mWide1);
+      mRow0 = mRow1;
+      mRow1 = -1;
+    } else {
+      widen(y0, mWide0.data());
+      mRow0 = y0;
+    }
+  }
+  if (y1 != mRow1) {
+    widen(y1, mWide1.data());
+    mRow1 = y1;
+  }
+  const size_t n = (size_t)mWidth * N;
+  size_t k = 0;
+#if defined(__x86_64__)
+  if (simdAvx2()) k = blendRowsAvx2(mWide0.data(), mWide1.data(), wy, mOut.data(), n);
+#endif
+  blendRows(mWide0.data(), mWide1.data(), wy, mOut.data(), n, k);
+  return mOut.data();
 }
 
 template void boxBlur<1>(Image<1>&, int, int);

@@ -52,13 +52,19 @@ class Upsampler {
   const uint8_t* row(int y);
 
  private:
+  // Reduced row `sy` enlarged across, in 8.8 fixed point, into `out`.
+  void widen(int sy, uint16_t* out) const;
+
   const Image<N>& mSmall;
   int mFactor;
   int mWidth;
-  int mHeight;
   std::vector<int> mX0;
   std::vector<uint16_t> mWx;
-  std::vector<uint16_t> mTmp;
+  // The two widened reduced rows the current full rows lie between.
+  int mRow0 = -1;
+  int mRow1 = -1;
+  std::vector<uint16_t> mWide0;
+  std::vector<uint16_t> mWide1;
   std::vector<uint8_t> mOut;
 };
 

@@ -135,6 +135,24 @@ TEST(SizeModifier, RowTrailingDividerPacksFromTheBorder) {
   EXPECT_FLOAT_EQ(cells.values[0].x2, 1.0f - 3 * 0.14f);
 }
 
+TEST(SizeModifier, RowTrailingDividerKeepsBoostedCellsAtTheLimit) {
+  // Five in a row, focus 1, its right handler dragged 0.06: cell 3 is marked,
+  // so cells 2 and 4 take 3 / 2 of their share. Capping cell 2 only against
+  // the border would leave it 0.135 wide; it stops at 0.14 instead.
+  const CLyGridHandlerInfo* handler = handlerOf(5, 3, 1, 1);
+  Cells cells{
+      {0, 0, 0.14f, 1}, {0.14f, 0, 0.29f, 1}, {0.29f, 0, 0.455f, 1}, {0.455f, 0, 0.6f, 1}, {0.6f, 0, 1, 1}};
+  std::vector<CLyFloatRectangle> candidates(cells.values);
+  CLyPoint drag(60, 0);
+  CLySizeModifier modifier(3, 1, 1, cells.pointers, candidates, handler, &drag);
+  EXPECT_TRUE(modifier.modifyX(0.06f, 0.14f, 1, {0, 0, 0, 1, 0}));
+  EXPECT_NEAR(cells.values[4].x1, 0.63f, 1e-6);
+  EXPECT_NEAR(cells.values[3].x1, 0.49f, 1e-6);
+  EXPECT_NEAR(cells.values[2].x2 - cells.values[2].x1, 0.14f, 1e-6);
+  EXPECT_FLOAT_EQ(cells.values[1].x2, cells.values[2].x1);
+  EXPECT_FLOAT_EQ(cells.values[0].x2, 0.14f);
+}
+
 TEST(SizeModifier, ColumnRuleIsTheRowRuleOnTheVerticalAxis) {
   pictavo::test::loadedCatalogue();
   CLyMultiGridDrawRectList list;
