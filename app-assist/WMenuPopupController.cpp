@@ -50,7 +50,8 @@ Evas_Object* WMenuPopupController::onCreateView(Evas_Object*, void*) {
     LYLOG_E("Cannot create ctxpopup");
     return nullptr;
   }
-  elm_object_style_set(ctx, "more/default");
+  // Themes without the device's menu style get the plain ctxpopup.
+  if (!elm_object_style_set(ctx, "more/default")) elm_object_style_set(ctx, "default");
   elm_ctxpopup_auto_hide_disabled_set(ctx, EINA_TRUE);
   eext_object_event_callback_add(ctx, EEXT_CALLBACK_BACK, __onBackKey, this);
   eext_object_event_callback_add(ctx, EEXT_CALLBACK_MORE, __onBackKey, this);
@@ -112,7 +113,12 @@ void WMenuPopupController::__onDismissed(void*, Evas_Object* obj, void*) {
 }
 
 void WMenuPopupController::__onBackKey(void*, Evas_Object* obj, void*) {
-  elm_ctxpopup_dismiss(obj);
+  // An empty menu has nothing to animate away, so it would never report
+  // its dismissal.
+  if (!elm_ctxpopup_first_item_get(obj))
+    evas_object_del(obj);
+  else
+    elm_ctxpopup_dismiss(obj);
 }
 
 Elm_Object_Item* WMenuPopupController::appendItem(const char* label, std::function<void()> cb) {

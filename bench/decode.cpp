@@ -6,6 +6,7 @@
 //                                   N times; prints "decode_inproc: min median max (ms)"
 //   bench_decode mem FILE           decodes FILE once; prints the rise of the peak
 //                                   resident memory it caused ("mem_rise_kb: K")
+//   bench_decode seeds DIR          writes small pictures of every format (fuzz seeds)
 //
 // Photos of `gen`: p12_1..6.jpg 4000 x 3000 photo-like, quality 92, 4:2:0, with
 // EXIF orientation 6 on p12_2 and p12_5; p24_base.jpg and p24_prog.jpg 6000 x
@@ -117,6 +118,29 @@ int gen(const std::string& dir) {
   return 0;
 }
 
+int seeds(const std::string& dir) {
+  const PixelFn pix = photoLike(3);
+  JpegOptions prog;
+  prog.progressive = true;
+  JpegOptions gray;
+  gray.grayscale = true;
+  gray.app1 = exifWithOrientation(6);
+  PngOptions alpha;
+  alpha.alpha = true;
+  PngOptions interlaced;
+  interlaced.interlaced = true;
+  auto index = [](int x, int y) { return (x / 3 + y / 2) % 4; };
+  bool ok = writeJpeg(dir + "/a.jpg", 37, 23, pix) && writeJpeg(dir + "/p.jpg", 37, 23, pix, prog) &&
+            writeJpeg(dir + "/g.jpg", 19, 17, pix, gray) && writePng(dir + "/a.png", 37, 23, pix) &&
+            writePng(dir + "/alpha.png", 21, 13, pix, alpha) && writePng(dir + "/i.png", 37, 23, pix, interlaced) &&
+            writeGif(dir + "/a.gif", 37, 23, index, true) && writeGif(dir + "/i.gif", 37, 23, index, false, 1, true) &&
+            writeBytes(dir + "/a.bmp", makeBmp(17, 9, 24, pix)) &&
+            writeBytes(dir + "/d.bmp", makeBmp(17, -9, 32, pix)) &&
+            writeBytes(dir + "/p.bmp", makeBmp(17, 9, 8, nullptr, 16, [](int x, int) { return x; })) &&
+            writeBytes(dir + "/a.wbmp", makeWbmp(19, 7, [](int x, int y) { return ((x + y) & 3) == 0; }));
+  return ok ? 0 : 1;
+}
+
 long maxRssKb() {
   struct rusage u;
   getrusage(RUSAGE_SELF, &u);
@@ -127,11 +151,12 @@ long maxRssKb() {
 
 int main(int argc, char** argv) {
   if (argc < 3) {
-    fprintf(stderr, "usage: %s gen DIR | decode [-r N] FILE... | mem FILE\n", argv[0]);
+    fprintf(stderr, "usage: %s gen DIR | seeds DIR | decode [-r N] FILE... | mem FILE\n", argv[0]);
     return 2;
   }
   const std::string mode = argv[1];
   if (mode == "gen") return gen(argv[2]);
+  if (mode == "seeds") return seeds(argv[2]);
   CLyAppData::getInstance();  // made on the main thread before any decoder thread
   if (mode == "mem") {
     // Touch everything a decode needs once on a tiny image, so the rise is the decode's own.

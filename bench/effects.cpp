@@ -10,9 +10,9 @@
 // and one 12 MB memcpy as the bandwidth floor) and, when /usr/bin/python3 has
 // Pillow, Pillow's sepia matrix and grey + contrast on the same size.
 #include <algorithm>
-#include <ctime>
 #include <cstdio>
 #include <cstring>
+#include <ctime>
 #include <functional>
 #include <string>
 #include <vector>
@@ -138,7 +138,8 @@ int main(int argc, char** argv) {
     for (int k = 0; k < 4; ++k) photo8[i + (size_t)k] = photo9[i + 3 - (size_t)k];
   std::vector<uint8_t> out(photo9.size());
 
-  printf("# effects on %dx%d, single thread, thread CPU time, median of %d runs after 1 warm-up (ms)\n", kW, kH, runs);
+  printf("# effects on %dx%d, single thread, thread CPU time, median of %d runs after 1 warm-up (ms)\n", kW,
+         kH, runs);
   printf("%-3s %-13s %-5s %9s %9s %9s %7s  %s\n", "#", "effect", "code", "look", "engine/8", "engine/9",
          "target", "class");
   int misses = 0;

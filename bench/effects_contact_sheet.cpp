@@ -15,7 +15,7 @@
 
 namespace {
 
-constexpr int kTileW = 480, kTileH = 320, kCols = 5, kGap = 12, kLabelH = 34;
+constexpr int kTileW = 420, kTileH = 280, kCols = 5, kGap = 10, kLabelH = 32;
 
 const char* englishLabel(const char* id) {
   static const char* const kNames[][2] = {

@@ -30,10 +30,11 @@ IN=$W/in; OUT=$W/out; mkdir -p "$IN" "$OUT"
 P12=("$IN"/p12_*.jpg)
 
 us() { local t=$EPOCHREALTIME; echo "${t/./}"; }
-# CPU time (user + sys) of all finished children so far, in microseconds.
-cpu_us() {
-  times | awk 'NR == 2 { t = 0; for (i = 1; i <= 2; i++) { split($i, p, /[ms]/); t += p[1] * 60 + p[2] }
-                         printf "%d\n", t * 1e6 }'
+# CPU time (user + sys) of all finished children, in microseconds, from a
+# file written by `times` (which must run in this shell, not a subshell).
+cpu_of() {
+  awk 'NR == 2 { t = 0; for (i = 1; i <= 2; i++) { split($i, p, /[ms]/); t += p[1] * 60 + p[2] }
+                 printf "%d\n", t * 1e6 }' "$1"
 }
 stats() {
   sort -g | awk -v n="$1" -v u="${2:-ms}" '{a[NR]=$1/1000} END {
@@ -45,7 +46,8 @@ bench() {
   local name=$1 i t0 t1 c0 c1; shift; local ts=() cs=()
   for ((i = 0; i < WARMUP; i++)); do "$@" >/dev/null; done
   for ((i = 0; i < RUNS; i++)); do
-    c0=$(cpu_us); t0=$(us); "$@" >/dev/null; t1=$(us); c1=$(cpu_us)
+    times >"$W/t0"; t0=$(us); "$@" >/dev/null; t1=$(us); times >"$W/t1"
+    c0=$(cpu_of "$W/t0"); c1=$(cpu_of "$W/t1")
     ts+=($((t1 - t0))); cs+=($((c1 - c0)))
   done
   printf '%s\n' "${ts[@]}" | stats "$name" ms

@@ -29,6 +29,8 @@ FILE* openRegular(const std::string& path) {
     fclose(file);
     return nullptr;
   }
+  // Decoders read a few kilobytes at a time; a larger buffer saves system calls.
+  setvbuf(file, nullptr, _IOFBF, 64 * 1024);
   return file;
 }
 }  // namespace

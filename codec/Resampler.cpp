@@ -5,17 +5,37 @@
 #include <cstring>
 #include <new>
 
+#include "codec/CodecLog.h"
+
 #ifdef __SSE2__
 #include <emmintrin.h>
 #endif
-
-#include "codec/CodecLog.h"
 
 namespace BitmapFactory {
 
 namespace {
 constexpr int kWeightBits = 14;
 constexpr int kOne = 1 << kWeightBits;
+// Resized rows keep 7 bits below a level (at most 255 x 128, which fits a
+// signed 16-bit lane for the vector multiply-adds).
+constexpr int kFractionBits = 7;
+
+// acc[i] += w * src[i] over n values.
+void accumulate(int32_t* acc, const uint16_t* src, int32_t w, size_t n) {
+  size_t i = 0;
+#ifdef __SSE2__
+  const __m128i zero = _mm_setzero_si128();
+  const __m128i wv = _mm_set1_epi32(w & 0xffff);  // pairs (w, 0) for madd
+  for (; i + 8 <= n; i += 8) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(src + i));
+    __m128i* a = reinterpret_cast<__m128i*>(acc + i);
+    _mm_storeu_si128(a, _mm_add_epi32(_mm_loadu_si128(a), _mm_madd_epi16(_mm_unpacklo_epi16(v, zero), wv)));
+    _mm_storeu_si128(a + 1,
+                     _mm_add_epi32(_mm_loadu_si128(a + 1), _mm_madd_epi16(_mm_unpackhi_epi16(v, zero), wv)));
+  }
+#endif
+  for (; i < n; ++i) acc[i] += w * src[i];
+}
 }  // namespace
 
 Resampler::Resampler(int inWidth, int inHeight, int outWidth, int outHeight, uint8_t* out, bool bottomUp)
@@ -88,7 +108,7 @@ void Resampler::buildTaps(Taps& taps, int in, int out) {
 
 void Resampler::horizontal(const uint8_t* row, uint16_t* dst) const {
   const int16_t* weights = mHTaps.weight.data();
-  constexpr int kShift = kWeightBits - 8, kHalf = 1 << (kShift - 1);
+  constexpr int kShift = kWeightBits - kFractionBits, kHalf = 1 << (kShift - 1);
 #ifdef __SSE2__
   // Two neighbouring source pixels at a time: their channels interleaved as
   // 16-bit pairs, multiplied by the pair of weights and summed in one step.
@@ -118,11 +138,7 @@ void Resampler::horizontal(const uint8_t* row, uint16_t* dst) const {
       acc = _mm_add_epi32(acc, _mm_madd_epi16(pa, _mm_set1_epi32(static_cast<uint16_t>(w[k]))));
     }
     acc = _mm_srai_epi32(_mm_add_epi32(acc, half), kShift);
-    // Values fit 16 bits unsigned (at most 255 x 256); pack through signed
-    // saturation safely by offsetting.
-    acc = _mm_sub_epi32(acc, _mm_set1_epi32(32768));
-    const __m128i packed = _mm_add_epi16(_mm_packs_epi32(acc, acc), _mm_set1_epi16(-32768));
-    _mm_storel_epi64(reinterpret_cast<__m128i*>(dst), packed);
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(dst), _mm_packs_epi32(acc, acc));
   }
 #else
   for (int x = 0; x < mOutW; ++x, dst += 4) {
@@ -168,7 +184,7 @@ void Resampler::pushRow(const uint8_t* row) {
     if (k < 0 || k >= mVTaps.count[y]) continue;
     const int32_t w = mVTaps.weight[mVTaps.offset[y] + k];
     int32_t* acc = &mAcc[slot * rowLen];
-    for (size_t i = 0; i < rowLen; ++i) acc[i] += w * h[i];
+    accumulate(acc, h, w, rowLen);
   }
   while (mEmitted < mOutH && mVTaps.start[mEmitted] + mVTaps.count[mEmitted] <= mPushed) {
     storeRow(mEmitted, mAcc.data());
@@ -195,20 +211,32 @@ void Resampler::emitRow(int y) {
   for (int k = 0; k < mVTaps.count[y]; ++k) {
     const uint16_t* s = &mRows[static_cast<size_t>((start + k) % mRing) * rowLen];
     const int32_t wk = w[k];
-    for (size_t i = 0; i < rowLen; ++i) acc[i] += wk * s[i];
+    accumulate(acc, s, wk, rowLen);
   }
   storeRow(y, acc);
 }
 
-// Sums are levels x 256 x (1 << 14) of non-negative weights adding up to
+// Sums are levels x 128 x (1 << 14) of non-negative weights adding up to
 // one, so they come back to bytes without clamping, and a premultiplied
 // colour stays at or below its alpha.
 void Resampler::storeRow(int y, const int32_t* acc) {
   const int outY = mBottomUp ? mOutH - 1 - y : y;
   uint8_t* dst = mOut + static_cast<size_t>(outY) * mOutW * 4;
   const size_t rowLen = static_cast<size_t>(mOutW) * 4;
-  constexpr int kShift = kWeightBits + 8, kHalf = 1 << (kShift - 1);
-  for (size_t i = 0; i < rowLen; ++i) dst[i] = static_cast<uint8_t>((acc[i] + kHalf) >> kShift);
+  constexpr int kShift = kWeightBits + kFractionBits, kHalf = 1 << (kShift - 1);
+  size_t i = 0;
+#ifdef __SSE2__
+  const __m128i half = _mm_set1_epi32(kHalf);
+  for (; i + 8 <= rowLen; i += 8) {
+    const __m128i lo = _mm_srai_epi32(
+        _mm_add_epi32(_mm_loadu_si128(reinterpret_cast<const __m128i*>(acc + i)), half), kShift);
+    const __m128i hi = _mm_srai_epi32(
+        _mm_add_epi32(_mm_loadu_si128(reinterpret_cast<const __m128i*>(acc + i + 4)), half), kShift);
+    const __m128i words = _mm_packs_epi32(lo, hi);
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(dst + i), _mm_packus_epi16(words, words));
+  }
+#endif
+  for (; i < rowLen; ++i) dst[i] = static_cast<uint8_t>((acc[i] + kHalf) >> kShift);
 }
 
 void Resampler::finish() {

@@ -34,7 +34,7 @@ class Resampler {
     int maxCount = 0;
   };
   static void buildTaps(Taps& taps, int in, int out);
-  // One source row resized to the output width, in 1/256 steps of a level.
+  // One source row resized to the output width, in 1/128 steps of a level.
   void horizontal(const uint8_t* row, uint16_t* dst) const;
   void emitReady();
   void emitRow(int y);

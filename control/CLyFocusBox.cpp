@@ -145,7 +145,8 @@ CLyFocusBox::CLyFocusBox() : _pImpl(new (std::nothrow) _CLyFocusBoxImpl) {
 
 CLyFocusBox::~CLyFocusBox() {
   if (!_pImpl) return;
-  if (_pImpl->parent) evas_object_event_callback_del_full(_pImpl->parent, EVAS_CALLBACK_DEL, onParentDel, _pImpl);
+  if (_pImpl->parent)
+    evas_object_event_callback_del_full(_pImpl->parent, EVAS_CALLBACK_DEL, onParentDel, _pImpl);
   for (int i = 0; i < kGripCount; ++i) {
     unwatchAndDelete(_pImpl, _pImpl->grips[i]);
     unwatchAndDelete(_pImpl, _pImpl->icons[i]);
@@ -198,7 +199,8 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
   evas_object_image_alpha_set(image, EINA_TRUE);
   // Covers the parent where it is; a canvas at (0, 0) would miss the part
   // of a parent placed lower or further right.
-  _pImpl->canvas = new (std::nothrow) CLyCairoCanvas(image, CLyRectangle(x, y, w > 0 ? w : 1, h > 0 ? h : 1), false);
+  _pImpl->canvas =
+      new (std::nothrow) CLyCairoCanvas(image, CLyRectangle(x, y, w > 0 ? w : 1, h > 0 ? h : 1), false);
   if (!_pImpl->canvas || !_pImpl->canvas->isValid()) {
     LYLOG_E("Failed to add canvas");
     delete _pImpl->canvas;
@@ -224,8 +226,9 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
       if (evas_object_image_load_error_get(icon) != EVAS_LOAD_ERROR_NONE)
         LYLOG_E("Failed to load icon %s", normal.c_str());
     }
-    uxt_theme_object_set_color(icon, LY_COLOR_MAIN);
+    // Colours after joining: an elementary parent gives new members its own colour.
     if (smartParent) evas_object_smart_member_add(icon, smartParent);
+    uxt_theme_object_set_color(icon, LY_COLOR_MAIN);
     evas_object_hide(icon);
     _pImpl->icons[i] = icon;
     watch(_pImpl, icon);
@@ -233,7 +236,6 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
   // Grips after the icons: they lie on top and catch the finger.
   for (int i = 0; i < kGripCount; ++i) {
     Evas_Object* grip = evas_object_rectangle_add(evas);
-    evas_object_color_set(grip, 0, 0, 0, 0);
     evas_object_repeat_events_set(grip, EINA_TRUE);
     evas_object_data_set(grip, kGripTypeKey, (void*)(intptr_t)kGripTypes[i]);
     evas_object_data_set(grip, kGripIndexKey, (void*)(intptr_t)(i + 1));
@@ -241,6 +243,7 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
     evas_object_event_callback_add(grip, EVAS_CALLBACK_MOUSE_UP, __onGripMouseUp, this);
     evas_object_event_callback_add(grip, EVAS_CALLBACK_MOUSE_MOVE, __onGripMouseMoveCb, this);
     if (smartParent) evas_object_smart_member_add(grip, smartParent);
+    evas_object_color_set(grip, 0, 0, 0, 0);  // an invisible touch area
     evas_object_hide(grip);
     _pImpl->grips[i] = grip;
     watch(_pImpl, grip);
@@ -365,8 +368,8 @@ Evas_Object* CLyFocusBox::getImageObject() const {
   return _pImpl ? _pImpl->image : nullptr;
 }
 
-bool CLyFocusBox::filterMove(const CLyPoint& last, unsigned int lastTimestamp, int x, int y, unsigned int timestamp,
-                             int threshold, CLyPoint& delta, CLyPoint& next) {
+bool CLyFocusBox::filterMove(const CLyPoint& last, unsigned int lastTimestamp, int x, int y,
+                             unsigned int timestamp, int threshold, CLyPoint& delta, CLyPoint& next) {
   const int dx = x - last.x;
   const int dy = y - last.y;
   if (abs(dx) < threshold && abs(dy) < threshold) return false;

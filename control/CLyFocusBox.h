@@ -69,8 +69,8 @@ class CLyFocusBox {
   // (accepted at `lastTimestamp`) moving to (x, y) at `timestamp` makes a
   // step. On acceptance fills `delta` (an axis below the threshold reports
   // 0) and `next` (the new last position). `threshold` is 5 scaled pixels.
-  static bool filterMove(const CLyPoint& last, unsigned int lastTimestamp, int x, int y, unsigned int timestamp,
-                         int threshold, CLyPoint& delta, CLyPoint& next);
+  static bool filterMove(const CLyPoint& last, unsigned int lastTimestamp, int x, int y,
+                         unsigned int timestamp, int threshold, CLyPoint& delta, CLyPoint& next);
 
  private:
   static void __onGripMouseDown(void* data, Evas* e, Evas_Object* obj, void* info);

@@ -149,7 +149,8 @@ CLyGesture::~CLyGesture() {
   if (!_pImpl) return;
   __detach();
   if (_pImpl->target)
-    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel, _pImpl);
+    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel,
+                                        _pImpl);
   delete _pImpl;
 }
 
@@ -161,7 +162,8 @@ void CLyGesture::setTarget(Evas_Object* target) {
   if (!_pImpl || target == _pImpl->target) return;
   __detach();
   if (_pImpl->target)
-    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel, _pImpl);
+    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel,
+                                        _pImpl);
   _pImpl->target = target;
   if (target) {
     evas_object_event_callback_add(target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel, _pImpl);
@@ -222,18 +224,18 @@ Evas_Object* CLyGesture::onCreateView(Evas_Object* parent, void*) {
                            I::onMomentum<ELM_GESTURE_STATE_START>, _pImpl);
   elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_MOVE,
                            I::onMomentum<ELM_GESTURE_STATE_MOVE>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_END, I::onMomentum<ELM_GESTURE_STATE_END>,
-                           _pImpl);
+  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_END,
+                           I::onMomentum<ELM_GESTURE_STATE_END>, _pImpl);
   elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_ABORT,
                            I::onMomentum<ELM_GESTURE_STATE_ABORT>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_START, I::onZoom<ELM_GESTURE_STATE_START>,
-                           _pImpl);
+  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_START,
+                           I::onZoom<ELM_GESTURE_STATE_START>, _pImpl);
   elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_MOVE, I::onZoom<ELM_GESTURE_STATE_MOVE>,
                            _pImpl);
   elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_END, I::onZoom<ELM_GESTURE_STATE_END>,
                            _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_ABORT, I::onZoom<ELM_GESTURE_STATE_ABORT>,
-                           _pImpl);
+  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_ABORT,
+                           I::onZoom<ELM_GESTURE_STATE_ABORT>, _pImpl);
   __attach();
   return layer;
 }
@@ -249,18 +251,12 @@ void CLyGesture::__attach() {
   Evas_Object* t = _pImpl->target;
   using I = _CLyGestureImpl;
   // Presses and moves first, releases last: see the header.
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_DOWN, kBeforeLayer, I::onMouseDown,
-                                          _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_MOVE, kBeforeLayer, I::onMouseMove,
-                                          _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_DOWN, kBeforeLayer, I::onMultiDown,
-                                          _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_MOVE, kBeforeLayer, I::onMultiMove,
-                                          _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_UP, kAfterLayer, I::onMouseUp,
-                                          _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_UP, kAfterLayer, I::onMultiUp,
-                                          _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_DOWN, kBeforeLayer, I::onMouseDown, _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_MOVE, kBeforeLayer, I::onMouseMove, _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_DOWN, kBeforeLayer, I::onMultiDown, _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_MOVE, kBeforeLayer, I::onMultiMove, _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_UP, kAfterLayer, I::onMouseUp, _pImpl);
+  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_UP, kAfterLayer, I::onMultiUp, _pImpl);
   elm_gesture_layer_attach(_pImpl->layer, t);
   _pImpl->attached = true;
 }

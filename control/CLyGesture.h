@@ -46,9 +46,9 @@ struct CLyGestureInfo {
   int y = 0;
   int startX = 0;  // momentum: where the line started; otherwise the same as x, y
   int startY = 0;
-  int device = 0;      // multi-touch device (finger) index; 0 for the mouse
-  int fingers = 1;     // fingers involved in a gesture
-  double zoom = 1.0;   // zoom factor (zoom gesture)
+  int device = 0;     // multi-touch device (finger) index; 0 for the mouse
+  int fingers = 1;    // fingers involved in a gesture
+  double zoom = 1.0;  // zoom factor (zoom gesture)
   unsigned int timestamp = 0;
 };
 

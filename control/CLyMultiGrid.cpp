@@ -178,6 +178,12 @@ void CLyMultiGrid::onEvent(const CLyEvent& event) {
   int w = 0, h = 0;
   CLyAppData::getInstance()->getScreenSize(&w, &h);
   LYLOG_D("win size: %d %d", w, h);
+  if (w <= 0 || h <= 0) {
+    // No screen size (no window, or an engine without a screen): a 1 x 1
+    // collage would be useless, so keep the current size.
+    w = _pImpl->viewWidth;
+    h = _pImpl->viewHeight;
+  }
   setViewSize(_pImpl->ratio, w, h);
   __relayout();
   __updateFocusRect();

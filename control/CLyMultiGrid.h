@@ -80,7 +80,8 @@ class CLyMultiGrid : public CLyControl {
   // longer side of the largest decoded photo. False when there is no photo.
   bool getSaveSize(int limit, int& width, int& height) const;
   // The same rule for any list of photos and ratio, before a control exists.
-  static bool computeSaveSize(CLyMultiGridSrcItemList* srcItemList, int ratio, int limit, int& width, int& height);
+  static bool computeSaveSize(CLyMultiGridSrcItemList* srcItemList, int ratio, int limit, int& width,
+                              int& height);
   // A copy of a photo's bitmap (index -1 or -2: the current cell); null on failure.
   Bitmap* clone(int index) const;
 
@@ -172,6 +173,7 @@ class CLyMultiGrid : public CLyControl {
   void __notifyMainView();
   void __showFocusHandler();
   void __resizeFocusRect(const CLyPoint& delta, int dotIndex);
+  void __endHandlerDrag();
   int __tryUpdateCurrentIndex(int x, int y);
   void __onMomentum(int state, int x, int y, int fingers);
   void __movePhoto(int x, int y);

@@ -48,8 +48,8 @@ int scaled(double size) {
 
 // Touch state that only this file uses, kept behind _CLyMultiGridImpl::touchExtra.
 struct _CLyMultiGridTouchState {
-  Evas_Object* hoverSwallow = nullptr;  // image object in "elm.swallow.hover"
-  Evas_Object* responseImage = nullptr; // zoom-in of the cell that received a swapped photo
+  Evas_Object* hoverSwallow = nullptr;   // image object in "elm.swallow.hover"
+  Evas_Object* responseImage = nullptr;  // zoom-in of the cell that received a swapped photo
   int responseIndex = -1;
   Elm_Transit* zoomInTransit = nullptr;
   Elm_Transit* moveBackTransit = nullptr;
@@ -59,6 +59,9 @@ struct _CLyMultiGridTouchState {
   bool tapPending = false;
   int tapPressedIndex = -1;
   int tapTouchedIndex = -1;
+  // Cells drawn with the draft filter during a handler drag.
+  bool drafting = false;
+  cairo_filter_t savedFilter = CAIRO_FILTER_BILINEAR;
 };
 
 namespace {
@@ -131,11 +134,22 @@ void CLyMultiGrid::__createHover() {
   box->setPressCallback([this](bool pressed) {
     _pImpl->handlerPressState = pressed ? 1 : 2;
     LYLOG_D("In focus pot: %d", _pImpl->handlerPressState);
+    if (!pressed) __endHandlerDrag();
   });
   box->setMoveCallback([this](const CLyPoint& delta, int dotIndex) { __resizeFocusRect(delta, dotIndex); });
   // The layout gets its final place only when the window lays it out.
   evas_object_event_callback_add(_pImpl->layout, EVAS_CALLBACK_RESIZE, __onLayoutGeometry, this);
   evas_object_event_callback_add(_pImpl->layout, EVAS_CALLBACK_MOVE, __onLayoutGeometry, this);
+}
+
+void CLyMultiGrid::__endHandlerDrag() {
+  _CLyMultiGridTouchState* ts = touchState(_pImpl);
+  if (!ts || !ts->drafting) return;
+  ts->drafting = false;
+  if (!_pImpl->canvas) return;
+  _pImpl->canvas->setFilter(ts->savedFilter);
+  __updateGridImages();
+  if (_pImpl->focusBox && __isValidItemIndex(_pImpl->currentIndex)) __updateFocusRect();
 }
 
 void CLyMultiGrid::__onLayoutGeometry(void* data, Evas*, Evas_Object*, void*) {
@@ -339,7 +353,8 @@ void CLyMultiGrid::__onMouseMove(int x, int y) {
   if (_pImpl->fingerCount < 2) return;
   _pImpl->finger1X = x;
   _pImpl->finger1Y = y;
-  if (_pImpl->singleImageMode && _pImpl->mode == LY_MULTIGRID_MODE_IDLE && !__isPlaceholder(__getClickIndex(x, y)))
+  if (_pImpl->singleImageMode && _pImpl->mode == LY_MULTIGRID_MODE_IDLE &&
+      !__isPlaceholder(__getClickIndex(x, y)))
     __runReleaseEffect();
 }
 
@@ -534,7 +549,25 @@ void CLyMultiGrid::__resizeFocusRect(const CLyPoint& delta, int dotIndex) {
     return;
   }
   list->updateItem(current, info, dotIndex, delta);
+  // A divider drag repaints every cell along the divider on each step: draw
+  // them with the cheap filter while the finger moves, and once more
+  // properly when it lifts (__endHandlerDrag).
+  _CLyMultiGridTouchState* ts = touchState(_pImpl);
+  if (ts && _pImpl->canvas && !ts->drafting) {
+    ts->drafting = true;
+    ts->savedFilter = _pImpl->canvas->getFilter();
+    _pImpl->canvas->setFilter(CAIRO_FILTER_FAST);
+  }
+  // Photos are opaque: copying them (SOURCE) skips reading the canvas back.
+  // Placeholder icons need blending, so single-image mode keeps OVER.
+  cairo_t* cr = _pImpl->canvas ? _pImpl->canvas->getContext() : nullptr;
+  const bool copy = cr && !_pImpl->singleImageMode;
+  if (copy) {
+    cairo_save(cr);
+    cairo_set_operator(cr, CAIRO_OPERATOR_SOURCE);
+  }
   __drawGridImages();
+  if (copy) cairo_restore(cr);
   if (_pImpl->focusBox) {
     _pImpl->previousIndex = current;
     __destroyFocusRect();
@@ -561,7 +594,8 @@ int CLyMultiGrid::__tryUpdateCurrentIndex(int x, int y) {
 
 void CLyMultiGrid::__onMomentum(int state, int x, int y, int fingers) {
   const int mode = _pImpl->mode;
-  if (mode != LY_MULTIGRID_MODE_PRESSED && mode != LY_MULTIGRID_MODE_PANNING && mode != LY_MULTIGRID_MODE_DRAGGING) {
+  if (mode != LY_MULTIGRID_MODE_PRESSED && mode != LY_MULTIGRID_MODE_PANNING &&
+      mode != LY_MULTIGRID_MODE_DRAGGING) {
     LYLOG_D("View is not in MOVE/DRAG mode[%d]", mode);
     if (_pImpl->singleImageMode && mode == LY_MULTIGRID_MODE_IDLE && !__isPlaceholder(__getClickIndex(x, y)))
       __runReleaseEffect();
@@ -570,7 +604,8 @@ void CLyMultiGrid::__onMomentum(int state, int x, int y, int fingers) {
   // Two fingers pinch; they never pan (the pan of one cell would follow the
   // point between the fingers, which may lie on another cell).
   if ((fingers > 1 || _pImpl->fingerCount > 1) &&
-      (state == LY_GESTURE_STATE_START || state == LY_GESTURE_STATE_MOVE) && mode != LY_MULTIGRID_MODE_DRAGGING) {
+      (state == LY_GESTURE_STATE_START || state == LY_GESTURE_STATE_MOVE) &&
+      mode != LY_MULTIGRID_MODE_DRAGGING) {
     LYLOG_D("Pinch, no move");
     return;
   }
@@ -842,7 +877,8 @@ void CLyMultiGrid::__createResponseDimRect(int target) {
   }
   const double r = _pImpl->drawRectList->getRoundness();
   canvas->clear();
-  canvas->fillRoundRect(CLyFloatRectangle(0, 0, 0, 0.5f), CLyFloatRectangle(0, 0, (float)cw, (float)ch), r, r);
+  canvas->fillRoundRect(CLyFloatRectangle(0, 0, 0, 0.5f), CLyFloatRectangle(0, 0, (float)cw, (float)ch), r,
+                        r);
   canvas->update();
   delete canvas;
   evas_object_move(image, (int)cell.x1, (int)cell.y1);

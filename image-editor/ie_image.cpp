@@ -226,8 +226,7 @@ bool loadDirect(IeImageSmartData* sd, const void* pixels, int w, int h, int iw, 
   return true;
 }
 
-bool loadByPreload(IeImageSmartData* sd, Evas_Object* obj, const void* pixels, int w, int h, int iw, int ih,
-                   int factor) {
+bool loadByPreload(IeImageSmartData* sd, const void* pixels, int w, int h, int iw, int ih, int factor) {
   // The canvas is made at the size it renders at; the photo is scaled onto it.
   Ecore_Evas* ee = ecore_evas_buffer_new(iw, ih);
   if (!ee) {
@@ -263,7 +262,6 @@ bool loadByPreload(IeImageSmartData* sd, Evas_Object* obj, const void* pixels, i
   sd->shownW = iw;
   sd->shownH = ih;
   LYLOG_D("iw width: %d, height: %d, scale_factor: %d", iw, ih, factor);
-  (void)obj;
   return true;
 }
 
@@ -332,7 +330,7 @@ bool ie_image_file_load_copy(Evas_Object* obj, const char* path, const void* pix
     const long long longSide = w > h ? w : h;
     const long long fitted = w > h ? iw : ih;
     const int factor = isAnimatedFormat(path) ? kFactorAnimated : scaleFactor(longSide, fitted);
-    ok = factor >= 3 ? loadByPreload(sd, obj, pixels, w, h, iw, ih, factor)
+    ok = factor >= 3 ? loadByPreload(sd, pixels, w, h, iw, ih, factor)
                      : loadDirect(sd, pixels, w, h, iw, ih, factor);
   }
   if (!ok) return false;

@@ -40,12 +40,18 @@ ObjectRecord* findRecord(Evas_Object* obj) {
   return nullptr;
 }
 
-// Shown on screen: the object and every clipper above it are visible (a
-// hidden container hides its members through its clipper).
+// Shown: the object and every widget above it up to its window are visible.
+// (Internal parts of a window, such as its frame, are not looked at.)
 bool reallyVisible(Evas_Object* obj) {
-  if (!evas_object_visible_get(obj)) return false;
-  for (Evas_Object* clip = evas_object_clip_get(obj); clip; clip = evas_object_clip_get(clip))
-    if (!evas_object_visible_get(clip)) return false;
+  for (Evas_Object* o = obj; o;) {
+    if (!evas_object_visible_get(o)) return false;
+    if (!elm_object_widget_check(o)) {
+      o = evas_object_smart_parent_get(o);
+      continue;
+    }
+    if (elm_win_get(o) == o) return true;
+    o = elm_object_parent_widget_get(o);
+  }
   return true;
 }
 
@@ -54,23 +60,14 @@ bool hasType(const ObjectRecord* record, Eext_Callback_Type type) {
                      [type](const Callback& cb) { return cb.type == type; });
 }
 
-void dispatch(Evas* evas, Eext_Callback_Type type) {
+bool dispatch(Evas* evas, Eext_Callback_Type type) {
   ObjectRecord* target = nullptr;
   for (ObjectRecord* record : gRecords) {
     if (evas_object_evas_get(record->obj) != evas || !hasType(record, type) || !reallyVisible(record->obj))
       continue;
     if (!target || record->stamp > target->stamp) target = record;
   }
-  for (ObjectRecord* record : gRecords)
-    LYLOG_E("DBG rec %p same=%d type=%d vis=%d stamp=%lu", record->obj, evas_object_evas_get(record->obj) == evas,
-            hasType(record, type), reallyVisible(record->obj), (unsigned long)record->stamp);
-  for (ObjectRecord* record : gRecords) {
-    for (Evas_Object* o = record->obj; o; o = evas_object_clip_get(o))
-      LYLOG_E("DBG clip %p %s vis=%d", o, evas_object_type_get(o), evas_object_visible_get(o));
-    for (Evas_Object* o = record->obj; o; o = evas_object_smart_parent_get(o))
-      LYLOG_E("DBG parent %p %s vis=%d", o, evas_object_type_get(o), evas_object_visible_get(o));
-  }
-  if (!target) return;
+  if (!target) return false;
   Evas_Object* obj = target->obj;
   // A callback may delete the object or change the callbacks: run a
   // snapshot, skipping entries that are gone by their turn.
@@ -84,6 +81,7 @@ void dispatch(Evas* evas, Eext_Callback_Type type) {
     });
     if (present) cb.func(cb.data, obj, nullptr);
   }
+  return true;
 }
 
 bool matches(const char* key, const char* const* names, size_t count) {
@@ -94,12 +92,15 @@ bool matches(const char* key, const char* const* names, size_t count) {
 
 void onKeyDown(void*, Evas* evas, Evas_Object*, void* event_info) {
   auto* ev = static_cast<Evas_Event_Key_Down*>(event_info);
-  if (!ev || !ev->keyname) return;
-  LYLOG_E("DBG key %s records=%zu", ev->keyname, gRecords.size());
+  if (!ev || !ev->keyname || (ev->event_flags & EVAS_EVENT_FLAG_ON_HOLD)) return;
+  bool handled = false;
   if (matches(ev->keyname, kBackKeys, 2))
-    dispatch(evas, EEXT_CALLBACK_BACK);
+    handled = dispatch(evas, EEXT_CALLBACK_BACK);
   else if (matches(ev->keyname, kMoreKeys, 2))
-    dispatch(evas, EEXT_CALLBACK_MORE);
+    handled = dispatch(evas, EEXT_CALLBACK_MORE);
+  // Widgets bind Escape to their own actions (a naviframe pops, a ctxpopup
+  // dismisses): a key handled here must not act a second time.
+  if (handled) ev->event_flags = static_cast<Evas_Event_Flags>(ev->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
 }
 
 // The canvas is passed as data: while a canvas is torn down the callback's

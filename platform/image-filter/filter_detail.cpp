@@ -2,9 +2,11 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <vector>
 
 #include "platform/image-filter/filter_looks.h"
 #include "platform/image-filter/filter_resample.h"
+#include "platform/image-filter/filter_simd.h"
 
 namespace imgfilter {
 
@@ -15,7 +17,7 @@ void lookSharpen(const Frame& f) {
   Gray luma, blur;
   downscaleLuma(f, 1, luma);
   blur = luma;
-  boxBlur(blur, std::max(1, (int)std::lround(f.shortSide() / 1200.0)), 2);
+  boxBlur(blur, std::max(1, (int)std::lround(f.shortSide() / 1500.0)), 1);
   constexpr int kThreshold = 2;
   constexpr int kAmount = 420;  // 8.8 fixed point: x 1.64
   constexpr int kCap = 44;
@@ -73,6 +75,66 @@ void edgesOf(const Gray& l, Gray& out, int low, int high) {
 
 }  // namespace
 
+namespace {
+
+constexpr int kInk = 24;
+
+// Banded colour with a little more saturation, darkened towards the ink by
+// the edge strength.
+template <int SR, int SG, int SB, int SA>
+inline uint32_t cartoonPixel(const uint8_t* u, int ink, uint32_t px, const int* ratio) {
+  const int k = ratio[luma709(u[0], u[1], u[2])];
+  int r = (u[0] * k) >> 8, g = (u[1] * k) >> 8, b = (u[2] * k) >> 8;
+  const int nl = ((r + g + b) * 21846) >> 16;  // (r + g + b) / 3 in this range
+  r = clamp255(nl + (((r - nl) * 290) >> 8));
+  g = clamp255(nl + (((g - nl) * 290) >> 8));
+  b = clamp255(nl + (((b - nl) * 290) >> 8));
+  r = (r * (255 - ink) + kInk * ink) / 255;
+  g = (g * (255 - ink) + kInk * ink) / 255;
+  b = (b * (255 - ink) + kInk * ink) / 255;
+  return (uint32_t)r << SR | (uint32_t)g << SG | (uint32_t)b << SB | (px & (255u << SA));
+}
+
+#if defined(__x86_64__)
+template <int SR, int SG, int SB, int SA>
+__attribute__((target("avx2"))) int cartoonRowAvx2(const uint8_t* u, const uint8_t* e, const uint8_t* s,
+                                                   uint8_t* d, int width, const int* ratio) {
+  using namespace simd;
+  const __m256i zero = _mm256_setzero_si256(), k255 = _mm256_set1_epi32(255), k310 = _mm256_set1_epi32(290);
+  const __m256i ink24 = _mm256_set1_epi32(kInk), third = _mm256_set1_epi32(21846);
+  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const __m256i up = load8(u + (size_t)x * 4), px = load8(s + (size_t)x * 4);
+    const __m256i u0 = channel<0>(up), u1 = channel<8>(up), u2 = channel<16>(up);
+    const __m256i k = _mm256_i32gather_epi32(ratio, luma(u0, u1, u2), 4);
+    __m256i r = _mm256_srai_epi32(_mm256_mullo_epi32(u0, k), 8);
+    __m256i g = _mm256_srai_epi32(_mm256_mullo_epi32(u1, k), 8);
+    __m256i b = _mm256_srai_epi32(_mm256_mullo_epi32(u2, k), 8);
+    const __m256i nl =
+        _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_add_epi32(_mm256_add_epi32(r, g), b), third), 16);
+    auto boost = [&](__m256i v) __attribute__((target("avx2"))) {
+      v = _mm256_add_epi32(nl, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(v, nl), k310), 8));
+      return _mm256_min_epi32(_mm256_max_epi32(v, zero), k255);
+    };
+    r = boost(r);
+    g = boost(g);
+    b = boost(b);
+    const __m256i ink = _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(e + x)));
+    const __m256i keep = _mm256_sub_epi32(k255, ink), inkPart = _mm256_mullo_epi32(ink24, ink);
+    r = div255(_mm256_add_epi32(_mm256_mullo_epi32(r, keep), inkPart));
+    g = div255(_mm256_add_epi32(_mm256_mullo_epi32(g, keep), inkPart));
+    b = div255(_mm256_add_epi32(_mm256_mullo_epi32(b, keep), inkPart));
+    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
+    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
+    store8(d + (size_t)x * 4, out);
+  }
+  return x;
+}
+#endif
+
+}  // namespace
+
 void lookCartoon(const Frame& f) {
   // Flat colour regions with dark outlines: the photo is smoothed on a copy
   // about 500 pixels on its short side, its luma is cut into a few bands
@@ -81,10 +143,13 @@ void lookCartoon(const Frame& f) {
   const int factor = reductionFor(f.shortSide(), 500);
   Rgba smooth;
   downscale(f, factor, smooth);
-  boxBlur(smooth, std::max(1, std::min(smooth.w, smooth.h) / 300), 2);
+  const int smallSide = std::min(smooth.w, smooth.h);
+  boxBlur(smooth, std::max(1, smallSide / 300), 2);
   Gray luma, edges;
+  // Outlines come from a smoother luma, so texture does not draw ink.
   lumaOf(smooth, luma);
-  edgesOf(luma, edges, 70, 190);
+  boxBlur(luma, std::max(1, smallSide / 200), 1);
+  edgesOf(luma, edges, 50, 160);
   boxBlur(edges, 1, 1);
 
   // Band luma: six levels with narrow soft steps between them; the ratio
@@ -98,31 +163,34 @@ void lookCartoon(const Frame& f) {
     const double v = std::min(1.0, 1.06 * (k + 0.5 + smooth01((fr - 0.88) / 0.12)) / kLevels);
     ratio[i] = (uint16_t)std::lround(256.0 * 255.0 * v / std::max(i, 12));
   }
+  std::vector<int> ratio32(ratio, ratio + 256);
+  // The enlarged edge map is soft; a steep curve turns it into crisp,
+  // anti-aliased ink lines.
+  uint8_t inkCurve[256];
+  for (int i = 0; i < 256; ++i) inkCurve[i] = (uint8_t)std::lround(235.0 * smooth01((i - 50) / 80.0));
+  std::vector<uint8_t> inkRow((size_t)f.width);
   Upsampler<4> upColour(smooth, factor, f.width, f.height);
   Upsampler<1> upEdges(edges, factor, f.width, f.height);
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
-    constexpr int kInk = 24;
+    constexpr int SR = 8 * c.r, SG = 8 * c.g, SB = 8 * c.b, SA = 8 * c.a;
+#if defined(__x86_64__)
+    const bool avx2 = simdAvx2();
+#endif
     for (int y = 0; y < f.height; ++y) {
       const uint8_t* u = upColour.row(y);
-      const uint8_t* e = upEdges.row(y);
+      const uint8_t* soft = upEdges.row(y);
+      for (int x = 0; x < f.width; ++x) inkRow[(size_t)x] = inkCurve[soft[x]];
+      const uint8_t* e = inkRow.data();
       const uint8_t* s = f.srcRow(y);
       uint8_t* d = f.dstRow(y);
-      for (int x = 0; x < f.width; ++x, u += 4, s += 4, d += 4) {
-        const int l = luma709(u[0], u[1], u[2]);
-        const int k = ratio[l];
-        int r = (u[0] * k) >> 8, g = (u[1] * k) >> 8, b = (u[2] * k) >> 8;
-        // A little more colour, as in a drawing.
-        const int nl = (r + g + b) / 3;
-        r = clamp255(nl + (((r - nl) * 310) >> 8));
-        g = clamp255(nl + (((g - nl) * 310) >> 8));
-        b = clamp255(nl + (((b - nl) * 310) >> 8));
-        const int ink = e[x];
-        const uint32_t px = load32(s);
-        store32(d, put((uint8_t)((r * (255 - ink) + kInk * ink) / 255), c.r) |
-                       put((uint8_t)((g * (255 - ink) + kInk * ink) / 255), c.g) |
-                       put((uint8_t)((b * (255 - ink) + kInk * ink) / 255), c.b) | (px & put(255, c.a)));
-      }
+      int x = 0;
+#if defined(__x86_64__)
+      if (avx2) x = cartoonRowAvx2<SR, SG, SB, SA>(u, e, s, d, f.width, ratio32.data());
+#endif
+      for (; x < f.width; ++x)
+        store32(d + (size_t)x * 4, cartoonPixel<SR, SG, SB, SA>(u + (size_t)x * 4, e[x],
+                                                                load32(s + (size_t)x * 4), ratio32.data()));
     }
   });
 }

@@ -3,10 +3,12 @@
 // bilinearly while it is blended, so wide radii stay cheap.
 #include <algorithm>
 #include <cmath>
+#include <vector>
 
 #include "platform/image-filter/filter_grade.h"
 #include "platform/image-filter/filter_looks.h"
 #include "platform/image-filter/filter_resample.h"
+#include "platform/image-filter/filter_simd.h"
 
 namespace imgfilter {
 
@@ -34,36 +36,78 @@ struct GlowBlend {
 };
 
 // Screens the enlarged blur over the destination, in place.
+struct GlowTables {
+  int soften;
+  bool fromLuma;
+  const int* glow[3];
+};
+
+template <int SR, int SG, int SB, int SA>
+inline uint32_t glowPixel(const uint8_t* u, uint32_t px, const GlowTables& t) {
+  const int br = u[0], bg = u[1], bb = u[2];
+  int r = (int)((px >> SR) & 255u), g = (int)((px >> SG) & 255u), bl = (int)((px >> SB) & 255u);
+  r += ((br - r) * t.soften) >> 8;
+  g += ((bg - g) * t.soften) >> 8;
+  bl += ((bb - bl) * t.soften) >> 8;
+  const int l = t.fromLuma ? luma709(br, bg, bb) : 0;
+  const int gr = t.glow[0][t.fromLuma ? l : br], gg = t.glow[1][t.fromLuma ? l : bg],
+            gbv = t.glow[2][t.fromLuma ? l : bb];
+  r += (gr * (255 - r) + 127) / 255;
+  g += (gg * (255 - g) + 127) / 255;
+  bl += (gbv * (255 - bl) + 127) / 255;
+  return (uint32_t)r << SR | (uint32_t)g << SG | (uint32_t)bl << SB | (px & (255u << SA));
+}
+
+#if defined(__x86_64__)
+template <int SR, int SG, int SB, int SA>
+__attribute__((target("avx2"))) int glowRowAvx2(const uint8_t* u, uint8_t* d, int width,
+                                                const GlowTables& t) {
+  using namespace simd;
+  const __m256i soften = _mm256_set1_epi32(t.soften), kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const __m256i up = load8(u + (size_t)x * 4), px = load8(d + (size_t)x * 4);
+    const __m256i br = channel<0>(up), bg = channel<8>(up), bb = channel<16>(up);
+    __m256i r = channel<SR>(px), g = channel<SG>(px), b = channel<SB>(px);
+    r = _mm256_add_epi32(r, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(br, r), soften), 8));
+    g = _mm256_add_epi32(g, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(bg, g), soften), 8));
+    b = _mm256_add_epi32(b, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(bb, b), soften), 8));
+    __m256i i0 = br, i1 = bg, i2 = bb;
+    if (t.fromLuma) i0 = i1 = i2 = luma(br, bg, bb);
+    r = screen(r, _mm256_i32gather_epi32(t.glow[0], i0, 4));
+    g = screen(g, _mm256_i32gather_epi32(t.glow[1], i1, 4));
+    b = screen(b, _mm256_i32gather_epi32(t.glow[2], i2, 4));
+    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
+    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
+    store8(d + (size_t)x * 4, out);
+  }
+  return x;
+}
+#endif
+
+// Screens the enlarged blur over the destination, in place.
 void blendGlow(const Frame& f, const Blurred& b, const GlowBlend& gb) {
   Upsampler<4> up(b.small, b.factor, f.width, f.height);
+  std::vector<int> tables(3 * 256);
+  for (int k = 0; k < 3; ++k)
+    for (int i = 0; i < 256; ++i) tables[(size_t)k * 256 + (size_t)i] = gb.glow[k][i];
+  const GlowTables t{gb.soften, gb.fromLuma, {&tables[0], &tables[256], &tables[512]}};
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
-    const int soften = gb.soften;
+    constexpr int SR = 8 * c.r, SG = 8 * c.g, SB = 8 * c.b, SA = 8 * c.a;
+#if defined(__x86_64__)
+    const bool avx2 = simdAvx2();
+#endif
     for (int y = 0; y < f.height; ++y) {
       const uint8_t* u = up.row(y);
       uint8_t* d = f.dstRow(y);
-      for (int x = 0; x < f.width; ++x, u += 4, d += 4) {
-        const int br = u[0], bg = u[1], bb = u[2];
-        const uint32_t px = load32(d);
-        int r = chan(px, c.r), g = chan(px, c.g), bl = chan(px, c.b);
-        r += ((br - r) * soften) >> 8;
-        g += ((bg - g) * soften) >> 8;
-        bl += ((bb - bl) * soften) >> 8;
-        int gr, gg, gbv;
-        if (gb.fromLuma) {
-          const int l = luma709(br, bg, bb);
-          gr = gb.glow[0][l];
-          gg = gb.glow[1][l];
-          gbv = gb.glow[2][l];
-        } else {
-          gr = gb.glow[0][br];
-          gg = gb.glow[1][bg];
-          gbv = gb.glow[2][bb];
-        }
-        store32(d, put((uint8_t)(r + ((gr * (255 - r) + 127) / 255)), c.r) |
-                       put((uint8_t)(g + ((gg * (255 - g) + 127) / 255)), c.g) |
-                       put((uint8_t)(bl + ((gbv * (255 - bl) + 127) / 255)), c.b) | (px & put(255, c.a)));
-      }
+      int x = 0;
+#if defined(__x86_64__)
+      if (avx2) x = glowRowAvx2<SR, SG, SB, SA>(u, d, f.width, t);
+#endif
+      for (; x < f.width; ++x)
+        store32(d + (size_t)x * 4,
+                glowPixel<SR, SG, SB, SA>(u + (size_t)x * 4, load32(d + (size_t)x * 4), t));
     }
   });
 }

@@ -177,36 +177,114 @@ void applyGrade(const Frame& f, const Grade& g) {
   });
 }
 
+namespace {
+
+struct SelectiveRow {
+  int satO, satT, dark;
+  bool greens;
+  const uint32_t* lut[3];  // indexed -256..511 (pointer at 0)
+};
+
+template <int SR, int SG, int SB, int SA>
+inline uint32_t selectivePixel(uint32_t px, const SelectiveRow& sr) {
+  const int r = (int)((px >> SR) & 255u), g = (int)((px >> SG) & 255u), b = (int)((px >> SB) & 255u);
+  const int l = luma709(r, g, b);
+  int w;
+  if (sr.greens) {
+    w = (g - (r > b ? r : b)) * 5;
+  } else {
+    const int greenish = g > r ? g - r : 0;
+    w = 2 * (g - b) - 4 * greenish;
+  }
+  w = w < 0 ? 0 : (w > 255 ? 255 : w);
+  const int sat = sr.satO + (((sr.satT - sr.satO) * w) >> 8);
+  const int k = 256 - ((sr.dark * w) >> 8);
+  const int nr = ((l + (((r - l) * sat) >> 8)) * k) >> 8;
+  const int ng = ((l + (((g - l) * sat) >> 8)) * k) >> 8;
+  const int nb = ((l + (((b - l) * sat) >> 8)) * k) >> 8;
+  return sr.lut[0][nr] << SR | sr.lut[1][ng] << SG | sr.lut[2][nb] << SB | (px & (255u << SA));
+}
+
+#if defined(__x86_64__)
+template <int SR, int SG, int SB, int SA>
+__attribute__((target("avx2"))) int selectiveRowAvx2(const uint8_t* s, uint8_t* d, int width,
+                                                     const SelectiveRow& sr) {
+  const __m256i k255 = _mm256_set1_epi32(255), zero = _mm256_setzero_si256();
+  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  const __m256i wR = _mm256_set1_epi32(54), wG = _mm256_set1_epi32(183), wB = _mm256_set1_epi32(19);
+  const __m256i satO = _mm256_set1_epi32(sr.satO), satD = _mm256_set1_epi32(sr.satT - sr.satO);
+  const __m256i dark = _mm256_set1_epi32(sr.dark), k256 = _mm256_set1_epi32(256);
+  const int* t0 = reinterpret_cast<const int*>(sr.lut[0]);
+  const int* t1 = reinterpret_cast<const int*>(sr.lut[1]);
+  const int* t2 = reinterpret_cast<const int*>(sr.lut[2]);
+  int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const __m256i px = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(s + (size_t)x * 4));
+    const __m256i r = _mm256_and_si256(_mm256_srli_epi32(px, SR), k255);
+    const __m256i g = _mm256_and_si256(_mm256_srli_epi32(px, SG), k255);
+    const __m256i b = _mm256_and_si256(_mm256_srli_epi32(px, SB), k255);
+    const __m256i l = _mm256_srai_epi32(
+        _mm256_add_epi32(_mm256_add_epi32(_mm256_mullo_epi32(r, wR), _mm256_mullo_epi32(g, wG)),
+                         _mm256_mullo_epi32(b, wB)),
+        8);
+    __m256i w;
+    if (sr.greens) {
+      w = _mm256_mullo_epi32(_mm256_sub_epi32(g, _mm256_max_epi32(r, b)), _mm256_set1_epi32(5));
+    } else {
+      const __m256i greenish = _mm256_max_epi32(_mm256_sub_epi32(g, r), zero);
+      w = _mm256_sub_epi32(_mm256_slli_epi32(_mm256_sub_epi32(g, b), 1), _mm256_slli_epi32(greenish, 2));
+    }
+    w = _mm256_min_epi32(_mm256_max_epi32(w, zero), k255);
+    const __m256i sat = _mm256_add_epi32(satO, _mm256_srai_epi32(_mm256_mullo_epi32(satD, w), 8));
+    const __m256i k = _mm256_sub_epi32(k256, _mm256_srai_epi32(_mm256_mullo_epi32(dark, w), 8));
+    const __m256i nr = _mm256_srai_epi32(
+        _mm256_mullo_epi32(
+            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(r, l), sat), 8)), k),
+        8);
+    const __m256i ng = _mm256_srai_epi32(
+        _mm256_mullo_epi32(
+            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(g, l), sat), 8)), k),
+        8);
+    const __m256i nb = _mm256_srai_epi32(
+        _mm256_mullo_epi32(
+            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(b, l), sat), 8)), k),
+        8);
+    __m256i out = _mm256_or_si256(_mm256_slli_epi32(_mm256_i32gather_epi32(t0, nr, 4), SR),
+                                  _mm256_slli_epi32(_mm256_i32gather_epi32(t1, ng, 4), SG));
+    out = _mm256_or_si256(out, _mm256_slli_epi32(_mm256_i32gather_epi32(t2, nb, 4), SB));
+    out = _mm256_or_si256(out, _mm256_and_si256(px, kAlpha));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(d + (size_t)x * 4), out);
+  }
+  return x;
+}
+#endif
+
+}  // namespace
+
 void applySelective(const Frame& f, const Selective& sel) {
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
-    const int satO = (int)std::lround(sel.satOther * 256.0);
-    const int satT = (int)std::lround(sel.satTarget * 256.0);
-    const int dark = (int)std::lround(sel.darkenTarget * 256.0);
-    const bool greens = sel.target == Selective::kGreens;
-    const WideLut &lr = sel.lut[0], &lg = sel.lut[1], &lb = sel.lut[2];
+    constexpr int SR = 8 * c.r, SG = 8 * c.g, SB = 8 * c.b, SA = 8 * c.a;
+    std::vector<uint32_t> tables(3 * 768);
+    for (int k = 0; k < 3; ++k)
+      for (int i = 0; i < 768; ++i) tables[(size_t)k * 768 + (size_t)i] = sel.lut[k].v[i];
+    const SelectiveRow sr{(int)std::lround(sel.satOther * 256.0),
+                          (int)std::lround(sel.satTarget * 256.0),
+                          (int)std::lround(sel.darkenTarget * 256.0),
+                          sel.target == Selective::kGreens,
+                          {&tables[256], &tables[768 + 256], &tables[1536 + 256]}};
+#if defined(__x86_64__)
+    const bool avx2 = simdAvx2();
+#endif
     for (int y = 0; y < f.height; ++y) {
       const uint8_t* s = f.srcRow(y);
       uint8_t* d = f.dstRow(y);
-      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-        const uint32_t px = load32(s);
-        const int r = chan(px, c.r), g = chan(px, c.g), b = chan(px, c.b);
-        const int l = luma709(r, g, b);
-        int w;
-        if (greens) {
-          w = (g - (r > b ? r : b)) * 5;
-        } else {
-          const int greenish = g > r ? g - r : 0;
-          w = 2 * (g - b) - 4 * greenish;
-        }
-        w = w < 0 ? 0 : (w > 255 ? 255 : w);
-        const int sat = satO + (((satT - satO) * w) >> 8);
-        const int k = 256 - ((dark * w) >> 8);
-        const int nr = ((l + (((r - l) * sat) >> 8)) * k) >> 8;
-        const int ng = ((l + (((g - l) * sat) >> 8)) * k) >> 8;
-        const int nb = ((l + (((b - l) * sat) >> 8)) * k) >> 8;
-        store32(d, put(lr.at(nr), c.r) | put(lg.at(ng), c.g) | put(lb.at(nb), c.b) | (px & put(255, c.a)));
-      }
+      int x = 0;
+#if defined(__x86_64__)
+      if (avx2) x = selectiveRowAvx2<SR, SG, SB, SA>(s, d, f.width, sr);
+#endif
+      for (; x < f.width; ++x)
+        store32(d + (size_t)x * 4, selectivePixel<SR, SG, SB, SA>(load32(s + (size_t)x * 4), sr));
     }
   });
 }

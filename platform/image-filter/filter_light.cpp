@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "platform/image-filter/filter_looks.h"
+#include "platform/image-filter/filter_simd.h"
 
 namespace imgfilter {
 
@@ -77,6 +78,30 @@ void drawSparkle(const Canvas& cv, int cx, int cy, double len, double intensity,
   }
 }
 
+#if defined(__x86_64__)
+template <int SR, int SG, int SB, int SA>
+__attribute__((target("avx2"))) int flareRowAvx2(const uint8_t* s, uint8_t* d, int width, int32_t dy2,
+                                                 const int32_t* dx2, int shift, const int* const* t) {
+  using namespace simd;
+  const __m256i vdy2 = _mm256_set1_epi32(dy2), maxIdx = _mm256_set1_epi32(4095);
+  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  const __m128i vshift = _mm_cvtsi32_si128(shift);
+  int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const __m256i d2 = _mm256_add_epi32(vdy2, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(dx2 + x)));
+    const __m256i i = _mm256_min_epu32(_mm256_srl_epi32(d2, vshift), maxIdx);
+    const __m256i px = load8(s + (size_t)x * 4);
+    const __m256i r = screen(channel<SR>(px), _mm256_i32gather_epi32(t[0], i, 4));
+    const __m256i g = screen(channel<SG>(px), _mm256_i32gather_epi32(t[1], i, 4));
+    const __m256i b = screen(channel<SB>(px), _mm256_i32gather_epi32(t[2], i, 4));
+    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
+    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
+    store8(d + (size_t)x * 4, out);
+  }
+  return x;
+}
+#endif
+
 }  // namespace
 
 void lookStardust(const Frame& f) {
@@ -124,22 +149,35 @@ void lookLightFlare(const Frame& f) {
     glow[1][(size_t)i] = (uint8_t)clamp255((int)std::lround(255.0 * clamp01(kc * 0.94 + kw * 0.72)));
     glow[2][(size_t)i] = (uint8_t)clamp255((int)std::lround(255.0 * clamp01(kc * 0.8 + kw * 0.42)));
   }
-  std::vector<int64_t> dx2((size_t)f.width);
-  for (int x = 0; x < f.width; ++x) dx2[(size_t)x] = (int64_t)std::llround((x - sx) * (x - sx));
+  // Squared distances fit 32 bits: sides are at most 16384.
+  std::vector<int32_t> dx2((size_t)f.width);
+  for (int x = 0; x < f.width; ++x) dx2[(size_t)x] = (int32_t)std::llround((x - sx) * (x - sx));
+  std::vector<int> tables(3 * 4096);
+  for (int k = 0; k < 3; ++k)
+    for (int i = 0; i < 4096; ++i) tables[(size_t)k * 4096 + (size_t)i] = glow[k][(size_t)i];
+  const int* t[3] = {&tables[0], &tables[4096], &tables[8192]};
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
-    const uint8_t *g0 = glow[0].data(), *g1 = glow[1].data(), *g2 = glow[2].data();
+    constexpr int SR = 8 * c.r, SG = 8 * c.g, SB = 8 * c.b, SA = 8 * c.a;
+#if defined(__x86_64__)
+    const bool avx2 = simdAvx2();
+#endif
     for (int y = 0; y < f.height; ++y) {
-      const int64_t dy2 = (int64_t)std::llround((y - sy) * (y - sy));
+      const int32_t dy2 = (int32_t)std::llround((y - sy) * (y - sy));
       const uint8_t* s = f.srcRow(y);
       uint8_t* d = f.dstRow(y);
-      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-        const size_t i = (size_t)std::min<int64_t>(4095, (dy2 + dx2[(size_t)x]) >> shift);
-        const uint32_t px = load32(s);
+      int x = 0;
+#if defined(__x86_64__)
+      if (avx2) x = flareRowAvx2<SR, SG, SB, SA>(s, d, f.width, dy2, dx2.data(), shift, t);
+#endif
+      for (; x < f.width; ++x) {
+        const int i = std::min(4095, (int)((uint32_t)(dy2 + dx2[(size_t)x]) >> shift));
+        const uint32_t px = load32(s + (size_t)x * 4);
         const int r = chan(px, c.r), g = chan(px, c.g), b = chan(px, c.b);
-        store32(d, put((uint8_t)(r + (g0[i] * (255 - r) + 127) / 255), c.r) |
-                       put((uint8_t)(g + (g1[i] * (255 - g) + 127) / 255), c.g) |
-                       put((uint8_t)(b + (g2[i] * (255 - b) + 127) / 255), c.b) | (px & put(255, c.a)));
+        store32(d + (size_t)x * 4, put(r + (t[0][i] * (255 - r) + 127) / 255, c.r) |
+                                       put(g + (t[1][i] * (255 - g) + 127) / 255, c.g) |
+                                       put(b + (t[2][i] * (255 - b) + 127) / 255, c.b) |
+                                       (px & put(255, c.a)));
       }
     }
     // Ghosts: position along the axis, radius (of the short side), colour, strength.
@@ -148,11 +186,11 @@ void lookLightFlare(const Frame& f) {
       Rgb col;
       double alpha;
     };
-    const Ghost ghosts[] = {{0.72, 0.035, {190, 255, 205}, 0.2},
-                            {1.05, 0.09, {255, 205, 150}, 0.1},
-                            {1.32, 0.05, {175, 205, 255}, 0.17},
-                            {1.62, 0.14, {255, 175, 225}, 0.08},
-                            {1.88, 0.06, {255, 240, 175}, 0.15}};
+    const Ghost ghosts[] = {{0.72, 0.035, {190, 255, 205}, 0.3},
+                            {1.05, 0.09, {255, 205, 150}, 0.16},
+                            {1.32, 0.05, {175, 205, 255}, 0.26},
+                            {1.62, 0.14, {255, 175, 225}, 0.13},
+                            {1.88, 0.06, {255, 240, 175}, 0.22}};
     const Canvas cv(f);
     const double cx = W / 2.0, cy = H / 2.0, s = f.shortSide();
     for (const Ghost& gh : ghosts) {

@@ -26,11 +26,11 @@ void lookPastel(const Frame& f) {
   // Light and soft: lifted shadows, low contrast, a pink cast in the
   // highlights and a mint one in the shadows.
   Grade g;
-  g.setSaturation(0.72);
-  auto base = [](double t) { return range(std::pow(contrast(t, -0.22), 0.88), 0.15, 0.98); };
-  g.setCurves([base](double t) { return base(t) + 0.05 * highlights(t) - 0.02 * shadows(t); },
-              [base](double t) { return base(t) - 0.01 * highlights(t) + 0.05 * shadows(t); },
-              [base](double t) { return base(t) + 0.03 * highlights(t) + 0.035 * shadows(t); });
+  g.setSaturation(0.82);
+  auto base = [](double t) { return range(std::pow(contrast(t, -0.12), 0.85), 0.1, 0.99); };
+  g.setCurves([base](double t) { return base(t) + 0.06 * highlights(t) - 0.02 * shadows(t); },
+              [base](double t) { return base(t) - 0.015 * highlights(t) + 0.05 * shadows(t); },
+              [base](double t) { return base(t) + 0.035 * highlights(t) + 0.03 * shadows(t); });
   applyGrade(f, g);
 }
 

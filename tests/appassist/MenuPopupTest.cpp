@@ -56,10 +56,19 @@ TEST_F(MenuPopupTest, OneCurrentMenuThatClosesOnBackAndOnDestroyCurrent) {
   EXPECT_EQ(WMenuPopupController::getCurrentMenu(), nullptr);
   WMenuPopupController::destroyCurrentMenu();  // none open: nothing happens
 
+  // A menu without items closes at once on back.
+  auto* empty = new TrackedMenu(&deleted);
+  ASSERT_TRUE(empty->createMenu(window->getEvasObj(), nullptr));
+  empty->showMenu();
+  appassist_test::pressKey(window->getEvasObj(), "Escape");
+  EXPECT_EQ(deleted, 2);
+
   auto* second = new TrackedMenu(&deleted);
   ASSERT_TRUE(second->createMenu(window->getEvasObj(), window->getBaseLayout()));
+  second->appendItem("Only", [] {});
   second->showMenu();
   WViewControllerWeakPtr weak = second->getWeakPtr();
+  pictavo::test::runMainLoop(0.1);
   // Back dismisses; the dismissal animation ends in deletion.
   appassist_test::pressKey(window->getEvasObj(), "Escape");
   EXPECT_TRUE(pictavo::test::runMainLoopUntil([&] { return weak.expired(); }, 5.0));
@@ -88,20 +97,8 @@ TEST_F(MenuPopupTest, ItemCallbackRunsBeforeTheMenuCloses) {
   });
   ASSERT_NE(item, nullptr);
   menu->showMenu();
-  // Selecting the item the way elm does: its select callback with the ctxpopup.
-  Evas_Object* ctx = menu->getEvasObj();
-  elm_ctxpopup_item_append(ctx, "unused", nullptr, nullptr, nullptr);
-  Evas_Object* track = elm_object_item_track(item);
-  ASSERT_NE(track, nullptr);
-  Evas_Coord x, y, w, h;
-  evas_object_geometry_get(track, &x, &y, &w, &h);
-  elm_object_item_untrack(item);
-  Evas* evas = evas_object_evas_get(ctx);
-  evas_event_feed_mouse_move(evas, x + w / 2, y + h / 2, 0, nullptr);
-  evas_event_feed_mouse_down(evas, 1, EVAS_BUTTON_NONE, 0, nullptr);
-  evas_event_feed_mouse_up(evas, 1, EVAS_BUTTON_NONE, 0, nullptr);
+  elm_ctxpopup_item_selected_set(item, EINA_TRUE);
   pictavo::test::runMainLoopUntil([&] { return chosen > 0 && deleted > 0; }, 2.0);
-  if (chosen == 0) GTEST_SKIP() << "the buffer engine did not deliver the click to the item";
   EXPECT_EQ(chosen, 1);
   EXPECT_EQ(deletedWhenChosen, 0);
   EXPECT_EQ(deleted, 1);

@@ -22,6 +22,8 @@ class NaviframeTest : public ::testing::Test {
     elm_config_transition_duration_factor_set(0.01);
   }
   void TearDown() override { window->destroy(); }
+  // Lets push transitions finish: a naviframe does not pop while animating.
+  void settle() { pictavo::test::runMainLoop(0.3); }
   int itemCount() const {
     Eina_List* items = elm_naviframe_items_get(naviframe->getEvasObj());
     int n = static_cast<int>(eina_list_count(items));
@@ -62,6 +64,7 @@ TEST_F(NaviframeTest, BackKeyPopsTheTopUnlessItsOnPopVetoes) {
   ASSERT_TRUE(naviframe->push(bottom));
   ASSERT_TRUE(naviframe->push(top));
   EXPECT_EQ(bottom->pushed, 1);
+  settle();
 
   top->allowPop = false;
   pressKey(naviframe->getEvasObj(), "Escape");
@@ -82,6 +85,7 @@ TEST_F(NaviframeTest, LastItemPopAsksTheHandler) {
   LifeCounts counts;
   auto* only = new CountingPage(&counts);
   ASSERT_TRUE(naviframe->push(only));
+  settle();
 
   int asked = 0;
   bool answer = false;
@@ -112,6 +116,7 @@ TEST_F(NaviframeTest, LastItemPopWithoutHandlerKeepsTheScreen) {
   LifeCounts counts;
   auto* only = new CountingPage(&counts);
   ASSERT_TRUE(naviframe->push(only));
+  settle();
   pressKey(naviframe->getEvasObj(), "Escape");
   EXPECT_EQ(only->popAsked, 1);
   pictavo::test::runMainLoop(0.05);
@@ -131,6 +136,7 @@ TEST_F(NaviframeTest, PopOutChecksThatTheViewIsOnTop) {
 
   ASSERT_TRUE(naviframe->push(bottom));
   ASSERT_TRUE(naviframe->push(top));
+  settle();
   EXPECT_THROW(bottom->popOut(), AssertionFired);
   EXPECT_TRUE(log.contains("WASSERT! This view is not on Top of Naviframe!"));
   EXPECT_TRUE(top->popOut());

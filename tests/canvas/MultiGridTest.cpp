@@ -14,6 +14,8 @@
 #include "codec/Bitmap.h"
 #include "codec/BitmapFactory.h"
 #include "common/CLyCairoCanvas.h"
+#include "common/CLyEvent.h"
+#include "common/ILyEventListener.h"
 #include "control/CLyMultiGrid.h"
 #include "control/CLyMultiGridSaver.h"
 #include "model/CLyMultiGridDrawRectList.h"
@@ -419,4 +421,24 @@ TEST_F(MultiGridTest, NothingToDrawIsHandledQuietly) {
   g2->refresh();
   EXPECT_TRUE(log.contains("Invalid src item image data"));
   g2->destroy();
+}
+
+TEST_F(MultiGridTest, WindowRotationRelaysOutAndRedraws) {
+  twoSideBySide();
+  auto* g = makeGrid(720, 1000, false);
+  const CLyRectangle before = *g->getCollageRect();
+  LogCapture log;
+  ILyEventListener& listener = *g;
+  listener.onEvent(CLyEvent(CLyEvent::CLOSE_OPTIONS));
+  EXPECT_FALSE(log.contains("win size"));
+  listener.onEvent(CLyEvent(CLyEvent::WINDOW_ROTATED, CLyEvent::MODE_IMMEDIATE, 90));
+  EXPECT_TRUE(log.contains("win size"));
+  EXPECT_TRUE(log.contains("count: 1"));  // drawn again
+  // Without a known screen size the collage keeps a usable size.
+  const CLyRectangle* after = g->getCollageRect();
+  ASSERT_NE(nullptr, after);
+  EXPECT_GT(after->w, 100);
+  EXPECT_GT(after->h, 100);
+  EXPECT_LE(after->w, std::max(before.w, 1000));
+  g->destroy();
 }

@@ -29,7 +29,8 @@ namespace {
 Bitmap* makePhoto(int index, int w, int h) {
   auto* pixels = static_cast<unsigned char*>(malloc((size_t)w * h * 4));
   if (!pixels) return nullptr;
-  const int base[6][3] = {{200, 60, 60}, {60, 180, 70}, {60, 90, 210}, {210, 190, 60}, {170, 70, 190}, {60, 190, 190}};
+  const int base[6][3] = {{200, 60, 60},  {60, 180, 70},  {60, 90, 210},
+                          {210, 190, 60}, {170, 70, 190}, {60, 190, 190}};
   const int* c = base[index % 6];
   for (int y = 0; y < h; ++y) {
     for (int x = 0; x < w; ++x) {
@@ -63,8 +64,8 @@ CollageHost::CollageHost(const HostOptions& options) {
   mList = new CLyMultiGridDrawRectList;
   mItems = new CLyMultiGridSrcItemList;
   for (int i = 0; i < options.photos; ++i) {
-    const bool placeholder = std::find(options.placeholders.begin(), options.placeholders.end(), i) !=
-                             options.placeholders.end();
+    const bool placeholder =
+        std::find(options.placeholders.begin(), options.placeholders.end(), i) != options.placeholders.end();
     auto* item = placeholder ? new CLyMultiGridSrcItem(std::string(), true) : new CLyMultiGridSrcItem();
     if (!placeholder) item->setBitmap(makePhoto(i, 1200 - i * 100, 900 + i * 50), true);
     mItems->add(item);
@@ -92,7 +93,8 @@ CollageHost::CollageHost(const HostOptions& options) {
   mGrid->refresh();
 
   CLyMultiGrid* grid = mGrid;
-  mGesture = new CLyGesture([grid](int type, int state, void* info) { grid->__processGestureEvent(type, state, info); });
+  mGesture = new CLyGesture(
+      [grid](int type, int state, void* info) { grid->__processGestureEvent(type, state, info); });
   mGesture->setLongTapTimeout(options.longTapSeconds);
   if (!mGesture->create(mWin, nullptr)) return;
   mGesture->setTarget(layout);

@@ -47,7 +47,8 @@ Evas_Object* findCanvasImage(CLyMultiGrid* grid) {
     int x = 0, y = 0, w = 0, h = 0;
     evas_object_geometry_get(o, &x, &y, &w, &h);
     const char* type = evas_object_type_get(o);
-    if (!found && type && strcmp(type, "image") == 0 && x == roi->x && y == roi->y && w == roi->w && h == roi->h)
+    if (!found && type && strcmp(type, "image") == 0 && x == roi->x && y == roi->y && w == roi->w &&
+        h == roi->h)
       found = o;
   }
   eina_list_free(members);
@@ -248,7 +249,8 @@ TEST(CollageTouch, LongPressOnTheSelectedCellLiftsItAndADropSwaps) {
 
   const CLyPoint p0 = host.centre(0), p1 = host.centre(1);
   host.down(p0.x, p0.y);
-  ASSERT_TRUE(runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
+  ASSERT_TRUE(
+      runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
   // Drag over to the other cell.
   for (int i = 1; i <= 10; ++i) {
     host.move(p0.x + (p1.x - p0.x) * i / 10, p0.y + (p1.y - p0.y) * i / 10);
@@ -286,7 +288,8 @@ TEST(CollageTouch, DroppingOnItsOwnCellSwapsNothing) {
   CLyMultiGridSrcItem* item = host.items()->get(1);
   const CLyPoint p = host.centre(1);
   host.down(p.x, p.y);
-  ASSERT_TRUE(runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
+  ASSERT_TRUE(
+      runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
   host.move(p.x + 30, p.y + 30);
   host.spin(0.02);
   host.up(p.x + 30, p.y + 30);

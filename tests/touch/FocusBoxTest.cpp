@@ -34,8 +34,8 @@ class FocusBoxTest : public ::testing::Test {
     box->setMoveCallback([this](const CLyPoint& d, int dot) { steps.push_back({d, dot}); });
     box->setPressCallback([this](bool pressed) { presses.push_back(pressed); });
     box->show(CLyFloatRectangle(100, 200, 200, 200), 0);
-    box->showHandlers({CLyFloatPoint(400, 300), CLyFloatPoint(250, 600), CLyFloatPoint(100, 600),
-                       CLyFloatPoint(250, 200)});
+    box->showHandlers(
+        {CLyFloatPoint(400, 300), CLyFloatPoint(250, 600), CLyFloatPoint(100, 600), CLyFloatPoint(250, 200)});
     pictavo::test::runMainLoop(0.01);
   }
   void TearDown() override {
@@ -171,6 +171,10 @@ TEST_F(FocusBoxTest, FrameIsDrawnAndClearHidesEverything) {
   evas_object_image_data_set(img, (void*)px);
   ASSERT_NE(nullptr, box->getGrip(0));
   EXPECT_TRUE(evas_object_visible_get(box->getGrip(0)));
+  // Touch areas stay invisible although an elementary parent colours its new members.
+  int alpha = -1;
+  evas_object_color_get(box->getGrip(0), nullptr, nullptr, nullptr, &alpha);
+  EXPECT_EQ(0, alpha);
 
   box->clear();
   px = static_cast<const uint32_t*>(evas_object_image_data_get(img, EINA_FALSE));
