@@ -5,6 +5,7 @@
 #include <random>
 #include <string>
 
+#include "app-assist/WDefine.h"
 #include "app-assist/WNaviframeController.h"
 #include "common/CLyLog.h"
 #include "platform/core/app_common.h"
@@ -119,6 +120,12 @@ void WContentViewController::createMoreButton(Elm_Object_Item* item, Evas_Smart_
   evas_object_show(button);
   if (clickedCb) evas_object_smart_callback_add(button, "clicked", clickedCb, data);
   elm_object_item_part_content_set(item, "toolbar_more_btn", button);
+  // Themes without the device's toolbar part show it as the title's right
+  // button; the more key finds it through the page either way.
+  if (elm_object_item_part_content_get(item, "toolbar_more_btn") != button)
+    elm_object_item_part_content_set(item, "title_right_btn", button);
+  if (Evas_Object* content = elm_object_item_content_get(item))
+    evas_object_data_set(content, kMoreButtonKey, button);
 }
 
 Evas_Object* WContentViewController::onCreateView(Evas_Object* parent, void*) {

@@ -60,8 +60,12 @@ void WNaviframeController::__onBackKey(void*, Evas_Object* obj, void*) {
 void WNaviframeController::__onMoreKey(void*, Evas_Object* obj, void*) {
   Elm_Object_Item* top = elm_naviframe_top_item_get(obj);
   if (!top) return;
-  if (Evas_Object* more = elm_object_item_part_content_get(top, "toolbar_more_btn"))
-    evas_object_smart_callback_call(more, "clicked", nullptr);
+  Evas_Object* more = elm_object_item_part_content_get(top, "toolbar_more_btn");
+  if (!more) {
+    Evas_Object* content = elm_object_item_content_get(top);
+    more = content ? static_cast<Evas_Object*>(evas_object_data_get(content, kMoreButtonKey)) : nullptr;
+  }
+  if (more) evas_object_smart_callback_call(more, "clicked", nullptr);
 }
 
 bool WNaviframeController::push(WContentViewController* vc, const char* name, void* param) {

@@ -87,7 +87,8 @@ double decodeAll(const std::vector<std::string>& files, std::vector<std::string>
 // the entropy-coded data is about as dense as a phone photo's (~2.7 bit/px at Q92).
 PixelFn camera(unsigned seed) {
   return [seed](int x, int y) -> Rgba {
-    uint32_t n = static_cast<uint32_t>(x) * 374761393u + static_cast<uint32_t>(y) * 668265263u + seed * 2246822519u;
+    uint32_t n =
+        static_cast<uint32_t>(x) * 374761393u + static_cast<uint32_t>(y) * 668265263u + seed * 2246822519u;
     n = (n ^ (n >> 13)) * 1274126177u;
     n ^= n >> 16;
     const int noise = static_cast<int>(n & 15) + static_cast<int>((n >> 4) & 15) - 15;
@@ -132,8 +133,10 @@ int seeds(const std::string& dir) {
   auto index = [](int x, int y) { return (x / 3 + y / 2) % 4; };
   bool ok = writeJpeg(dir + "/a.jpg", 37, 23, pix) && writeJpeg(dir + "/p.jpg", 37, 23, pix, prog) &&
             writeJpeg(dir + "/g.jpg", 19, 17, pix, gray) && writePng(dir + "/a.png", 37, 23, pix) &&
-            writePng(dir + "/alpha.png", 21, 13, pix, alpha) && writePng(dir + "/i.png", 37, 23, pix, interlaced) &&
-            writeGif(dir + "/a.gif", 37, 23, index, true) && writeGif(dir + "/i.gif", 37, 23, index, false, 1, true) &&
+            writePng(dir + "/alpha.png", 21, 13, pix, alpha) &&
+            writePng(dir + "/i.png", 37, 23, pix, interlaced) &&
+            writeGif(dir + "/a.gif", 37, 23, index, true) &&
+            writeGif(dir + "/i.gif", 37, 23, index, false, 1, true) &&
             writeBytes(dir + "/a.bmp", makeBmp(17, 9, 24, pix)) &&
             writeBytes(dir + "/d.bmp", makeBmp(17, -9, 32, pix)) &&
             writeBytes(dir + "/p.bmp", makeBmp(17, 9, 8, nullptr, 16, [](int x, int) { return x; })) &&

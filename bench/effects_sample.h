@@ -111,7 +111,7 @@ inline std::vector<uint8_t> makePhoto(int w, int h) {
         if (std::fabs(ex) < 0.35 && std::fabs(ey - 0.45) < 0.05) c = Col{0.75, 0.3, 0.3};
       }
       // Sensor noise.
-      const double n = (rnd(x, y, 99) - 0.5) * 0.03;
+      const double n = (rnd(x, y, 99) - 0.5) * 0.016;
       uint8_t* p = &px[((size_t)y * (size_t)w + (size_t)x) * 4];
       p[0] = (uint8_t)std::clamp((int)std::lround((c.b + n) * 255), 0, 255);
       p[1] = (uint8_t)std::clamp((int)std::lround((c.g + n) * 255), 0, 255);

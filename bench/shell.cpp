@@ -11,6 +11,10 @@
 // Usage: bench_shell [RUNS]   prints "name: min median max (ms)". Works in a
 // temporary folder; the user's own databases and pictures are not touched.
 
+// jpeglib.h needs size_t and FILE declared first.
+#include <cstddef>
+#include <cstdio>
+
 #include <jpeglib.h>
 #include <libexif/exif-data.h>
 #include <sqlite3.h>

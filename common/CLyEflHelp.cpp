@@ -2,7 +2,10 @@
 
 #include <Elementary.h>
 
+#include <cstdlib>
+
 #include "common/CLyLog.h"
+#include "common/CLyUtil.h"
 
 Evas_Object* CLyEflHelp::createLayout(Evas_Object* parent, const char* edjFile, const char* group,
                                       const char* name) {
@@ -28,7 +31,14 @@ Evas_Object* CLyEflHelp::createLayout(Evas_Object* parent, const char* name) {
     LYLOG_E("Cannot create layout");
     return nullptr;
   }
-  elm_layout_theme_set(layout, "layout", "application", "default");
+  if (!elm_layout_theme_set(layout, "layout", "application", "default")) {
+    // Without the theme extension loaded the theme may lack the group; the
+    // framework's own copy stands in.
+    char* edj = CLyUtil::getEdjPath("edje/WDefaultView.edj");
+    if (!edj || !elm_layout_file_set(layout, edj, "application"))
+      LYLOG_E("No application layout in the theme");
+    free(edj);
+  }
   evas_object_size_hint_weight_set(layout, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
   evas_object_size_hint_align_set(layout, EVAS_HINT_FILL, EVAS_HINT_FILL);
   evas_object_name_set(layout, name);

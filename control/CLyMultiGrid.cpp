@@ -11,6 +11,8 @@
 #include <cstdlib>
 #include <exception>
 #include <new>
+#include <utility>
+#include <vector>
 
 #include "codec/Bitmap.h"
 #include "codec/BitmapFactory.h"
@@ -594,9 +596,10 @@ void CLyMultiGrid::__createGridImage(int index, const CLyFloatRectangle& cell) {
 }
 
 // Draws the cells in order. newCrops: give every item the crop fitted to its
-// cell; skipUnchanged: leave cells whose crop and rectangle are unchanged
-// (clearing the old and new place of those that changed). False when drawing
-// stopped at a missing item or bitmap.
+// cell; skipUnchanged: leave cells whose crop and rectangle are unchanged, and
+// wipe the old and the new place of all changed cells before drawing any of
+// them (a cell growing into its neighbour's old place must not be wiped by
+// that neighbour). False when drawing stopped at a missing item or bitmap.
 bool CLyMultiGrid::__drawCells(bool clearFirst, bool newCrops, bool skipUnchanged) {
   CLyMultiGridSrcItemList* items = _pImpl->srcItemList;
   CLyMultiGridDrawRectList* rects = _pImpl->drawRectList;
@@ -604,27 +607,26 @@ bool CLyMultiGrid::__drawCells(bool clearFirst, bool newCrops, bool skipUnchange
   if (clearFirst) canvas->clear();
   const int count = items->count();
   if ((int)_pImpl->drawnRects.size() < count) _pImpl->drawnRects.resize(count);
+  std::vector<std::pair<int, CLyFloatRectangle>> toDraw;
+  bool complete = true;
   for (int i = 0; i < count; i++) {
     LYLOG_D("count: %d", i);
     CLyMultiGridSrcItem* item = items->get(i);
     if (!item) {
       LYLOG_E("Invalid src item");
-      return false;
+      complete = false;
+      break;
     }
     const CLyFloatRectangle d = rects->get(i);
     if (!item->getBitmap()) {
-      if (_pImpl->singleImageMode && item->isFake()) {
-        if (skipUnchanged && sameRect(d, _pImpl->drawnRects[i])) continue;
-        if (skipUnchanged) {
-          canvas->clearRect(_pImpl->drawnRects[i]);
-          canvas->clearRect(d);
-        }
-        __createGridImage(i, d);
-        _pImpl->drawnRects[i] = d;
-        continue;
+      if (!(_pImpl->singleImageMode && item->isFake())) {
+        LYLOG_E("Invalid src item image data");
+        complete = false;
+        break;
       }
-      LYLOG_E("Invalid src item image data");
-      return false;
+      if (skipUnchanged && sameRect(d, _pImpl->drawnRects[i])) continue;
+      toDraw.emplace_back(i, d);
+      continue;
     }
     if (newCrops) {
       const CLyRectangle* old = item->getSrcRect();
@@ -644,15 +646,19 @@ bool CLyMultiGrid::__drawCells(bool clearFirst, bool newCrops, bool skipUnchange
       }
       item->setSrcRect(owned);
     }
-    if (skipUnchanged) {
-      // The cell may have moved: wipe where it was as well as where it goes.
-      canvas->clearRect(_pImpl->drawnRects[i]);
-      canvas->clearRect(d);
-    }
-    __createGridImage(i, d);
-    _pImpl->drawnRects[i] = d;
+    toDraw.emplace_back(i, d);
   }
-  return true;
+  if (skipUnchanged) {
+    for (const auto& cell : toDraw) {
+      canvas->clearRect(_pImpl->drawnRects[cell.first]);
+      canvas->clearRect(cell.second);
+    }
+  }
+  for (const auto& cell : toDraw) {
+    __createGridImage(cell.first, cell.second);
+    _pImpl->drawnRects[cell.first] = cell.second;
+  }
+  return complete;
 }
 
 void CLyMultiGrid::__draw() {

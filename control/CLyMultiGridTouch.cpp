@@ -59,9 +59,12 @@ struct _CLyMultiGridTouchState {
   bool tapPending = false;
   int tapPressedIndex = -1;
   int tapTouchedIndex = -1;
-  // Cells drawn with the draft filter during a handler drag.
+  // Cells are drawn with the draft filter during a handler drag; the
+  // canvas's own filter comes back on release.
   bool drafting = false;
   cairo_filter_t savedFilter = CAIRO_FILTER_BILINEAR;
+  // The cell whose photo is lifted, from the long press to the drop.
+  int liftedIndex = -1;
 };
 
 namespace {
@@ -467,7 +470,10 @@ bool CLyMultiGrid::clearSelection() {
   if (!_pImpl || _pImpl->currentIndex < 0) return false;
   _pImpl->previousIndex = _pImpl->currentIndex;
   _pImpl->currentIndex = -1;
-  _pImpl->mode = LY_MULTIGRID_MODE_IDLE;
+  // A lifted photo must still be dropped and fly back: idling the mode
+  // there would leave it hanging over a blank cell.
+  if (_pImpl->mode != LY_MULTIGRID_MODE_DRAGGING && _pImpl->mode != LY_MULTIGRID_MODE_DROPPING)
+    _pImpl->mode = LY_MULTIGRID_MODE_IDLE;
   __destroyFocusRect();
   return true;
 }
@@ -735,6 +741,7 @@ void CLyMultiGrid::__onLongTap(int state, int x, int y) {
   LYLOG_D("Same index");
   if (index != _pImpl->currentIndex || !__isValidItemIndex(index)) return;
   _pImpl->mode = LY_MULTIGRID_MODE_DRAGGING;
+  if (_CLyMultiGridTouchState* ts = touchState(_pImpl)) ts->liftedIndex = index;
   __cleanGridImage(index);
   __createDragImage();
 }
@@ -894,7 +901,9 @@ void CLyMultiGrid::__createResponseDimRect(int target) {
 void CLyMultiGrid::__dropDragImage(int x, int y) {
   _CLyMultiGridTouchState* state = touchState(_pImpl);
   CLyMultiGridSrcItemList* items = _pImpl->srcItemList;
-  const int source = _pImpl->currentIndex;
+  // The lifted cell, even if the selection was cleared meanwhile.
+  const int source = state && state->liftedIndex >= 0 ? state->liftedIndex : _pImpl->currentIndex;
+  if (state) state->liftedIndex = -1;
   const int target = __getClickIndex(x, y);
   int dropTarget = source;
   if (__isValidItemIndex(target) && target != source && items->swap(source, target)) {

@@ -72,7 +72,8 @@ void CLyImageDecoderThread::run() {
   }
   DecodeOptions header;
   const int parsed = BitmapFactory::parseImage(mPath, header);
-  const bool supported = BitmapFactory::isSupportedType(header.imageType) || header.imageType == IMAGE_TYPE_PNG;
+  const bool supported =
+      BitmapFactory::isSupportedType(header.imageType) || header.imageType == IMAGE_TYPE_PNG;
   LYLOG_D("bSupported = %d", supported);
   if (parsed != 1 || !supported) {
     mListener->onInvalidateMultiGrid(mIndex, nullptr);

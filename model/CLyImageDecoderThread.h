@@ -23,7 +23,8 @@ class CLyImageDecoderThread : public CLyThread {
 
   // The decoding target of a w x h image whose EXIF orientation is given,
   // within maxW x maxH once upright; never enlarged, never below 1 x 1.
-  static void computeTarget(int w, int h, int orientation, float maxW, float maxH, int* targetW, int* targetH);
+  static void computeTarget(int w, int h, int orientation, float maxW, float maxH, int* targetW,
+                            int* targetH);
   // EXIF orientation to a turn code of BitmapFactory::rotate (0 for none):
   // 3 -> 2, 6 -> 1, 8 -> 3; mirrored and unknown values are not turned.
   static int rotationForOrientation(int orientation);

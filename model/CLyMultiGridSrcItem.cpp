@@ -25,12 +25,15 @@ struct _CLyMultiGridSrcItemImpl {
 };
 
 namespace {
-inline int floorInt(double v) { return static_cast<int>(std::floor(v)); }
+inline int floorInt(double v) {
+  return static_cast<int>(std::floor(v));
+}
 }  // namespace
 
 CLyMultiGridSrcItem::CLyMultiGridSrcItem() : _pv(new _CLyMultiGridSrcItemImpl) {}
 
-CLyMultiGridSrcItem::CLyMultiGridSrcItem(const std::string& path, bool fake) : _pv(new _CLyMultiGridSrcItemImpl) {
+CLyMultiGridSrcItem::CLyMultiGridSrcItem(const std::string& path, bool fake)
+    : _pv(new _CLyMultiGridSrcItemImpl) {
   _pv->path = path;
   _pv->isFake = fake;
 }
@@ -75,20 +78,48 @@ void CLyMultiGridSrcItem::_resetCrop() {
   _pv->srcRect->set(x, y, x + cw, y + ch);
 }
 
-Bitmap* CLyMultiGridSrcItem::getBitmap() const { return _pv->bitmap; }
-const std::string& CLyMultiGridSrcItem::getPath() const { return _pv->path; }
-void CLyMultiGridSrcItem::setPath(const std::string& path) { _pv->path = path; }
-bool CLyMultiGridSrcItem::isFake() const { return _pv->isFake; }
-void CLyMultiGridSrcItem::setFake(bool fake) { _pv->isFake = fake; }
-bool CLyMultiGridSrcItem::isChecked() const { return _pv->checked; }
-void CLyMultiGridSrcItem::setChecked(bool checked) { _pv->checked = checked; }
-int CLyMultiGridSrcItem::getWidth() const { return _pv->width; }
-int CLyMultiGridSrcItem::getHeight() const { return _pv->height; }
-int64_t CLyMultiGridSrcItem::getPixelCount() const { return static_cast<int64_t>(_pv->width) * _pv->height; }
-const CLyRectangle* CLyMultiGridSrcItem::getSrcRect() const { return _pv->srcRect; }
-float CLyMultiGridSrcItem::getMinScale() const { return _pv->minScale; }
-float CLyMultiGridSrcItem::getMaxScale() const { return _pv->maxScale; }
-float CLyMultiGridSrcItem::getInitialCropRatio() const { return _pv->initialCropRatio; }
+Bitmap* CLyMultiGridSrcItem::getBitmap() const {
+  return _pv->bitmap;
+}
+const std::string& CLyMultiGridSrcItem::getPath() const {
+  return _pv->path;
+}
+void CLyMultiGridSrcItem::setPath(const std::string& path) {
+  _pv->path = path;
+}
+bool CLyMultiGridSrcItem::isFake() const {
+  return _pv->isFake;
+}
+void CLyMultiGridSrcItem::setFake(bool fake) {
+  _pv->isFake = fake;
+}
+bool CLyMultiGridSrcItem::isChecked() const {
+  return _pv->checked;
+}
+void CLyMultiGridSrcItem::setChecked(bool checked) {
+  _pv->checked = checked;
+}
+int CLyMultiGridSrcItem::getWidth() const {
+  return _pv->width;
+}
+int CLyMultiGridSrcItem::getHeight() const {
+  return _pv->height;
+}
+int64_t CLyMultiGridSrcItem::getPixelCount() const {
+  return static_cast<int64_t>(_pv->width) * _pv->height;
+}
+const CLyRectangle* CLyMultiGridSrcItem::getSrcRect() const {
+  return _pv->srcRect;
+}
+float CLyMultiGridSrcItem::getMinScale() const {
+  return _pv->minScale;
+}
+float CLyMultiGridSrcItem::getMaxScale() const {
+  return _pv->maxScale;
+}
+float CLyMultiGridSrcItem::getInitialCropRatio() const {
+  return _pv->initialCropRatio;
+}
 
 void CLyMultiGridSrcItem::setSrcRect(CLyRectangle* rect) {
   if (!rect) return;
@@ -138,7 +169,8 @@ CLyRectangle* CLyMultiGridSrcItem::checkRectInOrg(CLyRectangle* rect) const {
       }
     }
   }
-  rect->set(static_cast<int32_t>(l), static_cast<int32_t>(t), static_cast<int32_t>(r), static_cast<int32_t>(b));
+  rect->set(static_cast<int32_t>(l), static_cast<int32_t>(t), static_cast<int32_t>(r),
+            static_cast<int32_t>(b));
   return rect;
 }
 

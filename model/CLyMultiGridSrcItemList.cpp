@@ -38,7 +38,9 @@ CLyMultiGridSrcItem* CLyMultiGridSrcItemList::get(int index) const {
   return _pv->valid(index) ? _pv->items[index] : nullptr;
 }
 
-int CLyMultiGridSrcItemList::count() const { return static_cast<int>(_pv->items.size()); }
+int CLyMultiGridSrcItemList::count() const {
+  return static_cast<int>(_pv->items.size());
+}
 
 bool CLyMultiGridSrcItemList::remove(int index, bool deleteItem) {
   if (!_pv->valid(index)) return false;
@@ -70,8 +72,12 @@ void CLyMultiGridSrcItemList::select(int index) {
   _pv->moving = true;
 }
 
-int CLyMultiGridSrcItemList::getSelected() const { return _pv->selected; }
-bool CLyMultiGridSrcItemList::isMoving() const { return _pv->moving; }
+int CLyMultiGridSrcItemList::getSelected() const {
+  return _pv->selected;
+}
+bool CLyMultiGridSrcItemList::isMoving() const {
+  return _pv->moving;
+}
 
 bool CLyMultiGridSrcItemList::move(int index, int x, int y) {
   if (!_pv->moving || index != _pv->selected || !_pv->valid(index)) {
@@ -130,10 +136,18 @@ int CLyMultiGridSrcItemList::indexOfLargest() const {
   return best;
 }
 
-int CLyMultiGridSrcItemList::getDragSource() const { return _pv->dragSource; }
-void CLyMultiGridSrcItemList::setDragSource(int index) { _pv->dragSource = index; }
-int CLyMultiGridSrcItemList::getDragTarget() const { return _pv->dragTarget; }
-void CLyMultiGridSrcItemList::setDragTarget(int index) { _pv->dragTarget = index; }
+int CLyMultiGridSrcItemList::getDragSource() const {
+  return _pv->dragSource;
+}
+void CLyMultiGridSrcItemList::setDragSource(int index) {
+  _pv->dragSource = index;
+}
+int CLyMultiGridSrcItemList::getDragTarget() const {
+  return _pv->dragTarget;
+}
+void CLyMultiGridSrcItemList::setDragTarget(int index) {
+  _pv->dragTarget = index;
+}
 void CLyMultiGridSrcItemList::resetDrag() {
   _pv->dragSource = -1;
   _pv->dragTarget = -1;

@@ -227,7 +227,12 @@ bool buildWindow(PickerSession* session, app_control_launch_mode_e mode) {
 
   Evas_Object* label = elm_label_add(box);
   std::string header = title;
-  if (session->multiple) header += " (" + std::to_string(session->maxCount) + ")";
+  if (session->multiple) {
+    std::string most = tr("IDS_PICTAVO_BODY_UP_TO_PD", "up to %d");
+    size_t pos = most.find("%d");
+    if (pos != std::string::npos) most.replace(pos, 2, std::to_string(session->maxCount));
+    header += " (" + most + ")";
+  }
   elm_object_text_set(label, header.c_str());
   evas_object_size_hint_align_set(label, 0.5, 0.5);
   elm_box_pack_end(box, label);

@@ -59,13 +59,10 @@ inline uint32_t gradePixel(uint32_t px, int x, const GradeRow& gr) {
     o2 = (o2 * v) >> 8;
   }
   if (gr.noise) {
-    // Grain is stronger in the mid-tones, as on film. (x * 21846) >> 16 is x / 3 here.
     const int n = gr.noise[(gr.noiseStart + x) & 255];
-    const int l = ((o0 + o1 + o2) * 21846) >> 16;
-    const int amt = (n * (64 + ((l * (255 - l)) >> 6))) >> 8;
-    o0 = clamp255(o0 + amt);
-    o1 = clamp255(o1 + amt);
-    o2 = clamp255(o2 + amt);
+    o0 = clamp255(o0 + n);
+    o1 = clamp255(o1 + n);
+    o2 = clamp255(o2 + n);
   }
   return (uint32_t)o0 << SR | (uint32_t)o1 << SG | (uint32_t)o2 << SB | (px & (255u << SA));
 }
@@ -116,15 +113,10 @@ __attribute__((target("avx2"))) int gradeRowAvx2(const uint8_t* s, uint8_t* d, i
     if (gr.noise) {
       const __m256i n = _mm256_cvtepi8_epi32(
           _mm_loadl_epi64(reinterpret_cast<const __m128i*>(gr.noise + ((gr.noiseStart + x) & 255))));
-      const __m256i sum = _mm256_add_epi32(_mm256_add_epi32(o0, o1), o2);
-      const __m256i l = _mm256_srai_epi32(_mm256_mullo_epi32(sum, _mm256_set1_epi32(21846)), 16);
-      const __m256i mid = _mm256_srai_epi32(_mm256_mullo_epi32(l, _mm256_sub_epi32(k255, l)), 6);
-      const __m256i amt =
-          _mm256_srai_epi32(_mm256_mullo_epi32(n, _mm256_add_epi32(mid, _mm256_set1_epi32(64))), 8);
       const __m256i zero = _mm256_setzero_si256();
-      o0 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o0, amt), zero), k255);
-      o1 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o1, amt), zero), k255);
-      o2 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o2, amt), zero), k255);
+      o0 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o0, n), zero), k255);
+      o1 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o1, n), zero), k255);
+      o2 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o2, n), zero), k255);
     }
     __m256i out = _mm256_or_si256(_mm256_slli_epi32(o0, SR), _mm256_slli_epi32(o1, SG));
     out = _mm256_or_si256(out, _mm256_slli_epi32(o2, SB));

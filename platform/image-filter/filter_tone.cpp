@@ -64,7 +64,7 @@ void lookFilm(const Frame& f) {
   g.setCurves([base](double t) { return base(t) + 0.04 * highlights(t) - 0.05 * shadows(t); },
               [base](double t) { return base(t) + 0.01 * highlights(t) + 0.025 * shadows(t); },
               [base](double t) { return base(t) - 0.05 * highlights(t) + 0.03 * shadows(t); });
-  g.grain = 9;
+  g.grain = 6;
   g.seed = 0x46494c4d;  // "FILM"
   applyGrade(f, g);
 }
@@ -129,7 +129,7 @@ void lookOldPhoto(const Frame& f) {
               [t2](double t) { return sepiaTone(t2(t), 0.11, 0.47, 0.95); },
               [t2](double t) { return sepiaTone(t2(t), 0.07, 0.32, 0.78); });
   g.vignette = 0.45;
-  g.grain = 7;
+  g.grain = 5;
   g.seed = 0x4f4c4450;  // "OLDP"
   applyGrade(f, g);
 }

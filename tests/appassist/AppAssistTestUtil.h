@@ -4,11 +4,13 @@
 
 #include <Elementary.h>
 
+#include <cstdlib>
 #include <string>
 
 #include "app-assist/WContentViewController.h"
 #include "app-assist/WViewController.h"
 #include "app-assist/WWindowController.h"
+#include "platform/core/app_common.h"
 #include "tests/support/TestSupport.h"
 
 namespace appassist_test {

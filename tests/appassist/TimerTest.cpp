@@ -9,8 +9,39 @@ using appassist_test::CountingView;
 using appassist_test::LifeCounts;
 using pictavo::test::AssertionFired;
 using pictavo::test::LogCapture;
-using pictavo::test::runMainLoop;
-using pictavo::test::runMainLoopUntil;
+
+namespace {
+
+// Idlers only run when the main loop really goes idle, which single
+// iterations never do: run the loop itself until `done` or the timeout.
+template <typename Pred>
+bool runLoopUntil(Pred done, double timeout) {
+  struct State {
+    Pred* done;
+    double end;
+  } state{&done, ecore_time_get() + timeout};
+  if (done()) return true;
+  // The poll cancels itself when it ends the loop.
+  ecore_timer_add(
+      0.005,
+      [](void* data) -> Eina_Bool {
+        auto* s = static_cast<State*>(data);
+        if ((*s->done)() || ecore_time_get() > s->end) {
+          ecore_main_loop_quit();
+          return ECORE_CALLBACK_CANCEL;
+        }
+        return ECORE_CALLBACK_RENEW;
+      },
+      &state);
+  ecore_main_loop_begin();
+  return done();
+}
+
+void runMainLoop(double seconds) {
+  runLoopUntil([] { return false; }, seconds);
+}
+
+}  // namespace
 
 class TimerTest : public ::testing::Test {
  protected:
@@ -50,7 +81,7 @@ TEST_F(TimerTest, CallbackDeletingItsOwnOwnerEndsOnce) {
         return false;
       },
       nullptr, owner);
-  EXPECT_TRUE(runMainLoopUntil([&] { return timer.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return timer.expired(); }, 2.0));
   runMainLoop(0.02);
   EXPECT_EQ(fired, 1);
 }
@@ -69,7 +100,7 @@ TEST_F(TimerTest, ControllerDestroyedByItsOwnIdlerAndJob) {
         return true;
       },
       nullptr, view->getEvasObj());
-  EXPECT_TRUE(runMainLoopUntil([&] { return idler.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return idler.expired(); }, 2.0));
   runMainLoop(0.02);
   EXPECT_EQ(runs, 1);
   EXPECT_EQ(counts.destroyed, 1);
@@ -79,7 +110,7 @@ TEST_F(TimerTest, ControllerDestroyedByItsOwnIdlerAndJob) {
   ASSERT_TRUE(other->create(window->getBaseLayout(), nullptr));
   WTimerWeakPtr job = WTimer::addJob([&](void*) { other->destroy(); }, nullptr, other->getEvasObj());
   EXPECT_NE(WTimer::getJobHandle(job), nullptr);
-  EXPECT_TRUE(runMainLoopUntil([&] { return job.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return job.expired(); }, 2.0));
   EXPECT_EQ(counts.deleted, 2);
   window->destroy();
 }
@@ -93,21 +124,21 @@ TEST_F(TimerTest, IdlerRunsWhileItAsksAndAnimatorToo) {
         return ++runs < 3;
       },
       &data, owner);
-  EXPECT_TRUE(runMainLoopUntil([&] { return idler.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return idler.expired(); }, 2.0));
   runMainLoop(0.02);
   EXPECT_EQ(runs, 3);
 
   int frames = 0;
   WTimerWeakPtr animator = WTimer::addAnimator([&](void*) { return ++frames < 2; }, nullptr, owner);
   EXPECT_NE(WTimer::getAnimatorHandle(animator), nullptr);
-  EXPECT_TRUE(runMainLoopUntil([&] { return animator.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return animator.expired(); }, 2.0));
   EXPECT_EQ(frames, 2);
 }
 
 TEST_F(TimerTest, JobRunsOnceAndCancelStopsEverything) {
   int jobs = 0;
   WTimerWeakPtr job = WTimer::addJob([&](void*) { ++jobs; }, nullptr);
-  EXPECT_TRUE(runMainLoopUntil([&] { return job.expired(); }, 2.0));
+  EXPECT_TRUE(runLoopUntil([&] { return job.expired(); }, 2.0));
   runMainLoop(0.02);
   EXPECT_EQ(jobs, 1);
 

@@ -337,6 +337,15 @@ TEST_F(MultiGridTest, PartialRedrawRepaintsMovedCellsAndClearsWhereTheyWere) {
   log.clear();
   Peer::drawGridImages(g);
   EXPECT_EQ(2u, log.count("Same Rect"));
+  // The other way: cell 0 grows into the place cell 1 leaves.
+  mCells.getItem(0)->x2 = 0.7f;
+  mCells.getItem(1)->x1 = 0.7f;
+  Peer::drawGridImages(g);
+  for (int x : {100, 350, 450, 520}) {
+    EXPECT_EQ(255, alphaAt(x, 400)) << x;
+    EXPECT_EQ(255, d[400 * stride + x * 4 + 2]) << x;  // red channel: cell 0
+  }
+  EXPECT_EQ(255, d[400 * stride + 650 * 4 + 0]);  // blue: cell 1
   g->destroy();
 }
 
@@ -441,4 +450,34 @@ TEST_F(MultiGridTest, WindowRotationRelaysOutAndRedraws) {
   EXPECT_GT(after->h, 100);
   EXPECT_LE(after->w, std::max(before.w, 1000));
   g->destroy();
+}
+
+TEST_F(MultiGridTest, SavingFromTheScreenControlLeavesTheScreenPictureAlone) {
+  twoSideBySide();
+  auto* g = makeGrid(800, 800, false);
+  g->setBorderMarginValue(5);
+  CLyCairoCanvas* canvas = Peer::impl(g)->canvas;
+  const CLyRectangle* area = g->getCollageRect();
+  TempDir dir;
+  ASSERT_TRUE(g->save(dir.file("screen.jpg")));
+  Bitmap* out = decodeJpeg(dir.file("screen.jpg"));
+  ASSERT_NE(nullptr, out);
+  EXPECT_EQ(area->w, out->getWidth());
+  EXPECT_TRUE(near(pixelOf(out, 2, out->getHeight() / 2), {255, 255, 255}));  // white border in the file
+  delete out;
+  // ... but on screen the border stays transparent over the background object.
+  cairo_surface_flush(canvas->getSurface());
+  EXPECT_EQ(0,
+            cairo_image_surface_get_data(
+                canvas->getSurface())[(area->h / 2) * cairo_image_surface_get_stride(canvas->getSurface()) +
+                                      2 * 4 + 3]);
+  g->destroy();
+  // Nothing to save is refused.
+  CLyMultiGridSrcItemList none;
+  CLyMultiGridSaveRequest r;
+  r.cells = &mCells;
+  r.items = &none;
+  LogCapture log;
+  EXPECT_FALSE(CLyMultiGridSaver::save(mWindow->getEvasObj(), mParent, r, dir.file("none.jpg")));
+  EXPECT_NE(0, access(dir.file("none.jpg").c_str(), F_OK));
 }

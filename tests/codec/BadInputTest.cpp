@@ -57,7 +57,8 @@ TEST(BadInput, EmptyTextAndTruncatedFiles) {
   ASSERT_TRUE(writeBytes(dir.file("empty.jpg"), {}));
   EXPECT_EQ(decode(dir.file("empty.jpg")), nullptr);
   EXPECT_EQ(decodePngStatus(dir.file("empty.jpg")), -1);
-  ASSERT_TRUE(writeBytes(dir.file("text.jpg"), std::vector<uint8_t>({'J', 'F', 'I', 'F', ' ', 'n', 'o', 't'})));
+  ASSERT_TRUE(
+      writeBytes(dir.file("text.jpg"), std::vector<uint8_t>({'J', 'F', 'I', 'F', ' ', 'n', 'o', 't'})));
   EXPECT_EQ(decode(dir.file("text.jpg")), nullptr);
   EXPECT_TRUE(log.contains("not support file type"));
 
@@ -149,7 +150,8 @@ TEST(BadInput, ZeroAndHugeSizesRefusedFromTheHeader) {
 TEST(BadInput, GifBmpOddities) {
   TempDir dir;
   LogCapture log;
-  ASSERT_TRUE(writeGif(dir.file("none.gif"), 10, 10, [](int, int) { return 0; }, false, 0));
+  ASSERT_TRUE(writeGif(
+      dir.file("none.gif"), 10, 10, [](int, int) { return 0; }, false, 0));
   EXPECT_EQ(decode(dir.file("none.gif")), nullptr);
   EXPECT_TRUE(log.contains("decoding fail"));
 
@@ -161,7 +163,8 @@ TEST(BadInput, GifBmpOddities) {
   EXPECT_EQ(decode(dir.file("rle-down.bmp")), nullptr);
 
   // Palette of 4 colours, indexes up to 255: the picture shows, in black where out of range.
-  ASSERT_TRUE(writeBytes(dir.file("pal.bmp"), makeBmp(16, 4, 8, nullptr, 4, [](int x, int) { return x * 16; })));
+  ASSERT_TRUE(
+      writeBytes(dir.file("pal.bmp"), makeBmp(16, 4, 8, nullptr, 4, [](int x, int) { return x * 16; })));
   auto b = decode(dir.file("pal.bmp"), 16, 4);
   ASSERT_TRUE(b);
   EXPECT_EQ(b->getPixels()[4 * 15 + 3], 255);
@@ -171,7 +174,8 @@ TEST(BadInput, GifBmpOddities) {
   auto head = makeBmp(8, 8, 8, nullptr, 256, [](int, int) { return 0; });
   head.resize(14 + 40 + 256 * 4);
   head[30] = 1;
-  const std::vector<uint8_t> data = {4, 200, 0, 0, 2, 100, 0, 2, 3, 50, 0, 3, 1, 2, 3, 0, 0, 2, 100, 100, 0, 1};
+  const std::vector<uint8_t> data = {4, 200, 0, 0, 2, 100, 0, 2,   3,   50, 0,
+                                     3, 1,   2, 3, 0, 0,   2, 100, 100, 0,  1};
   head.insert(head.end(), data.begin(), data.end());
   ASSERT_TRUE(writeBytes(dir.file("rle.bmp"), head));
   auto r = decode(dir.file("rle.bmp"), 8, 8);
@@ -188,7 +192,8 @@ TEST(BadInput, CorruptBytesNeverCrash) {
   prog.progressive = true;
   ASSERT_TRUE(writeJpeg(dir.file("p.jpg"), 96, 64, photoLike(7), prog));
   ASSERT_TRUE(writePng(dir.file("a.png"), 96, 64, photoLike(8)));
-  ASSERT_TRUE(writeGif(dir.file("a.gif"), 96, 64, [](int x, int y) { return (x + y) % 4; }, true));
+  ASSERT_TRUE(writeGif(
+      dir.file("a.gif"), 96, 64, [](int x, int y) { return (x + y) % 4; }, true));
   ASSERT_TRUE(writeBytes(dir.file("a.bmp"), makeBmp(96, 64, 24, photoLike(9))));
   uint32_t seed = 12345;
   auto next = [&seed]() {

@@ -22,7 +22,8 @@ TEST(Bitmap, CreateSizesPerFormatAndZeroFill) {
   struct Case {
     int format;
     size_t size;
-  } cases[] = {{8, 4u * 5 * 3}, {7, 4u * 5 * 3}, {5, 4u * 5 * 3}, {0, 2u * 5 * 3}, {2, 15u + 2 * 3 * 2}, {42, 30u}};
+  } cases[] = {{8, 4u * 5 * 3}, {7, 4u * 5 * 3},      {5, 4u * 5 * 3},
+               {0, 2u * 5 * 3}, {2, 15u + 2 * 3 * 2}, {42, 30u}};
   for (const Case& c : cases) {
     std::unique_ptr<Bitmap> b(BitmapFactory::createBitmap(5, 3, c.format));
     ASSERT_TRUE(b) << c.format;
@@ -70,7 +71,7 @@ TEST(BitmapFactory, FileSizeAndParseOfEveryType) {
   struct Case {
     const char* name;
     int type, w, h;
-  } cases[] = {{"a.jpg", 1, 40, 30}, {"a.png", 3, 41, 31}, {"a.gif", 4, 42, 32},
+  } cases[] = {{"a.jpg", 1, 40, 30}, {"a.png", 3, 41, 31},  {"a.gif", 4, 42, 32},
                {"a.bmp", 2, 43, 33}, {"a.wbmp", 5, 44, 34}, {"text.jpg", 0, 0, 0}};
   for (const Case& c : cases) {
     DecodeOptions opt;

@@ -24,7 +24,9 @@ void expectQuadrants(const Bitmap& b, int tolerance = 40) {
   struct Probe {
     int x, y;
     int r, g, bl;
-  } probes[] = {{w / 4, h / 4, 255, 0, 0}, {3 * w / 4, h / 4, 0, 255, 0}, {w / 4, 3 * h / 4, 0, 0, 255},
+  } probes[] = {{w / 4, h / 4, 255, 0, 0},
+                {3 * w / 4, h / 4, 0, 255, 0},
+                {w / 4, 3 * h / 4, 0, 0, 255},
                 {3 * w / 4, 3 * h / 4, 255, 255, 255}};
   for (const Probe& p : probes) {
     const uint8_t* q = px(b, p.x, p.y);
@@ -62,7 +64,8 @@ TEST(Decode, JpegScaledToExactSizeAllVariants) {
   ASSERT_TRUE(writeJpeg(dir.file("gray.jpg"), 300, 200, quadrants(300, 200), gray));
   for (const char* name : {"base.jpg", "prog.jpg"}) {
     // 1/8, 1/4, 3/8, full and upscaled decodes, odd sizes and aspect changes.
-    for (auto wh : {std::pair<int, int>{100, 75}, {180, 135}, {333, 251}, {800, 600}, {1000, 700}, {77, 300}}) {
+    for (auto wh :
+         {std::pair<int, int>{100, 75}, {180, 135}, {333, 251}, {800, 600}, {1000, 700}, {77, 300}}) {
       auto b = decode(dir.file(name), wh.first, wh.second);
       ASSERT_TRUE(b) << name << " " << wh.first;
       EXPECT_EQ(b->getWidth(), wh.first);
@@ -77,6 +80,27 @@ TEST(Decode, JpegScaledToExactSizeAllVariants) {
   EXPECT_LT(px(*g, 30, 20)[0], 40);
   EXPECT_GT(px(*g, 120, 20)[0], 215);
   EXPECT_EQ(px(*g, 120, 20)[0], px(*g, 120, 20)[2]);
+}
+
+TEST(Decode, CmykJpeg) {
+  // Adobe files store inverted inks: 0 cyan ink is full red light, K 255 no black.
+  TempDir dir;
+  JpegOptions cmyk;
+  cmyk.cmyk = true;
+  cmyk.quality = 100;
+  ASSERT_TRUE(writeJpeg(
+      dir.file("c.jpg"), 64, 64,
+      [](int, int) {
+        return Rgba{0, 255, 255, 255};
+      },
+      cmyk));
+  auto b = decode(dir.file("c.jpg"), 32, 32);
+  ASSERT_TRUE(b);
+  const uint8_t* p = px(*b, 16, 16);
+  EXPECT_NEAR(p[0], 255, 3);  // blue
+  EXPECT_NEAR(p[1], 255, 3);  // green
+  EXPECT_NEAR(p[2], 0, 3);    // red
+  EXPECT_EQ(p[3], 255);
 }
 
 TEST(Decode, OtherColourFormats) {
@@ -105,7 +129,12 @@ TEST(Decode, PngRowByRowWithAlphaPremultiplied) {
   PngOptions alpha;
   alpha.alpha = true;
   ASSERT_TRUE(writePng(dir.file("q.png"), 400, 300, quadrants(400, 300)));
-  ASSERT_TRUE(writePng(dir.file("half.png"), 50, 40, [](int, int) { return Rgba{255, 128, 0, 128}; }, alpha));
+  ASSERT_TRUE(writePng(
+      dir.file("half.png"), 50, 40,
+      [](int, int) {
+        return Rgba{255, 128, 0, 128};
+      },
+      alpha));
   for (auto wh : {std::pair<int, int>{400, 300}, {200, 150}, {123, 77}, {600, 500}}) {
     auto b = decodePng(dir.file("q.png"), wh.first, wh.second);
     ASSERT_TRUE(b);
@@ -186,7 +215,8 @@ TEST(Decode, GifBmpWbmp) {
     ASSERT_TRUE(b) << name;
     expectQuadrants(*b, 1);
   }
-  ASSERT_TRUE(writeBytes(dir.file("p.bmp"), makeBmp(16, 8, 8, nullptr, 256, [](int x, int) { return x * 16; })));
+  ASSERT_TRUE(
+      writeBytes(dir.file("p.bmp"), makeBmp(16, 8, 8, nullptr, 256, [](int x, int) { return x * 16; })));
   auto p = decode(dir.file("p.bmp"), 16, 8);
   ASSERT_TRUE(p);
   EXPECT_EQ(px(*p, 3, 2)[0], 48);
@@ -212,7 +242,8 @@ TEST(Decode, ShrinkAveragesInsteadOfSampling) {
     auto b = decodePng(dir.file("c.png"), size, size);
     ASSERT_TRUE(b);
     for (int y = 1; y < size - 1; ++y)
-      for (int x = 1; x < size - 1; ++x) ASSERT_NEAR(px(*b, x, y)[1], 128, 20) << size << " " << x << "," << y;
+      for (int x = 1; x < size - 1; ++x)
+        ASSERT_NEAR(px(*b, x, y)[1], 128, 20) << size << " " << x << "," << y;
   }
 }
 

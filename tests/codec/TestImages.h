@@ -42,7 +42,8 @@ inline PixelFn quadrants(int w, int h) {
 // Smooth colour waves plus pseudo-random noise, about what a camera gives.
 inline PixelFn photoLike(unsigned seed) {
   return [seed](int x, int y) -> Rgba {
-    uint32_t n = (static_cast<uint32_t>(x) * 374761393u + static_cast<uint32_t>(y) * 668265263u + seed * 2246822519u);
+    uint32_t n =
+        (static_cast<uint32_t>(x) * 374761393u + static_cast<uint32_t>(y) * 668265263u + seed * 2246822519u);
     n = (n ^ (n >> 13)) * 1274126177u;
     const int noise = static_cast<int>((n >> 24) & 31) - 16;
     auto clamp = [](int v) { return static_cast<uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v)); };
@@ -79,10 +80,12 @@ struct JpegOptions {
   int quality = 92;
   bool progressive = false;
   bool grayscale = false;
+  bool cmyk = false;          // r, g, b, a of the pixel are written as C, M, Y, K (Adobe, inverted)
   std::vector<uint8_t> app1;  // EXIF block, written as APP1 when not empty
 };
 
-inline bool writeJpeg(const std::string& path, int w, int h, const PixelFn& pixel, const JpegOptions& o = {}) {
+inline bool writeJpeg(const std::string& path, int w, int h, const PixelFn& pixel,
+                      const JpegOptions& o = {}) {
   FILE* f = fopen(path.c_str(), "wb");
   if (!f) return false;
   jpeg_compress_struct c;
@@ -92,21 +95,26 @@ inline bool writeJpeg(const std::string& path, int w, int h, const PixelFn& pixe
   jpeg_stdio_dest(&c, f);
   c.image_width = static_cast<JDIMENSION>(w);
   c.image_height = static_cast<JDIMENSION>(h);
-  c.input_components = o.grayscale ? 1 : 3;
-  c.in_color_space = o.grayscale ? JCS_GRAYSCALE : JCS_RGB;
+  c.input_components = o.grayscale ? 1 : (o.cmyk ? 4 : 3);
+  c.in_color_space = o.grayscale ? JCS_GRAYSCALE : (o.cmyk ? JCS_CMYK : JCS_RGB);
   jpeg_set_defaults(&c);
   jpeg_set_quality(&c, o.quality, TRUE);
   if (o.progressive) jpeg_simple_progression(&c);
   jpeg_start_compress(&c, TRUE);
   if (!o.app1.empty())
     jpeg_write_marker(&c, JPEG_APP0 + 1, o.app1.data(), static_cast<unsigned>(o.app1.size()));
-  std::vector<uint8_t> row(static_cast<size_t>(w) * 3);
+  std::vector<uint8_t> row(static_cast<size_t>(w) * 4);
   while (c.next_scanline < c.image_height) {
     const int y = static_cast<int>(c.next_scanline);
     for (int x = 0; x < w; ++x) {
       const Rgba p = pixel(x, y);
       if (o.grayscale) {
         row[x] = p.g;
+      } else if (o.cmyk) {
+        row[x * 4] = p.r;
+        row[x * 4 + 1] = p.g;
+        row[x * 4 + 2] = p.b;
+        row[x * 4 + 3] = p.a;
       } else {
         row[x * 3] = p.r;
         row[x * 3 + 1] = p.g;

@@ -8,6 +8,7 @@
 #include "app-assist/WWindowController.h"
 #include "control/CLyControl.h"
 #include "manager/CLyControlManager.h"
+#include "platform/core/app_common.h"
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::LogCapture;

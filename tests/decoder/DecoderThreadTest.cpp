@@ -89,8 +89,8 @@ std::string corners(const Bitmap& b) {
 
 // Raw EXIF (little-endian TIFF) of one IFD0: the orientation entry and an
 // optional Exif-IFD pointer, then the next-IFD offset.
-std::vector<uint8_t> rawExif(int orientation, uint32_t nextIfd, bool exifPointer = false, uint32_t pointer = 0,
-                             uint16_t entryCount = 0) {
+std::vector<uint8_t> rawExif(int orientation, uint32_t nextIfd, bool exifPointer = false,
+                             uint32_t pointer = 0, uint16_t entryCount = 0) {
   std::vector<uint8_t> v = {'E', 'x', 'i', 'f', 0, 0, 'I', 'I', 42, 0, 8, 0, 0, 0};
   const uint16_t entries = entryCount ? entryCount : static_cast<uint16_t>(exifPointer ? 2 : 1);
   put16(v, entries);
@@ -147,9 +147,10 @@ TEST_F(DecoderThread, TargetSizesAndRotationTable) {
       ASSERT_TRUE(w == 720 || h == 1280 || (w == iw && h == ih)) << iw << "x" << ih;
     }
   }
-  const std::map<int, int> table = {{1, 0}, {2, 0}, {3, 2}, {4, 0}, {5, 0}, {6, 1},
+  const std::map<int, int> table = {{1, 0}, {2, 0}, {3, 2}, {4, 0}, {5, 0},  {6, 1},
                                     {7, 0}, {8, 3}, {0, 0}, {9, 0}, {-1, 0}, {65535, 0}};
-  for (auto& e : table) EXPECT_EQ(CLyImageDecoderThread::rotationForOrientation(e.first), e.second) << e.first;
+  for (auto& e : table)
+    EXPECT_EQ(CLyImageDecoderThread::rotationForOrientation(e.first), e.second) << e.first;
 }
 
 TEST_F(DecoderThread, PhotosComeUprightAtTheTargetSize) {
@@ -203,11 +204,11 @@ TEST_F(DecoderThread, BadFilesAndBrokenExif) {
       exifWithOrientation(0),
       exifWithOrientation(9),
       exifWithOrientation(65535),
-      rawExif(1, 8),                      // IFD0 is its own next IFD
-      rawExif(1, 0, true, 8),             // the Exif IFD is IFD0 again
-      rawExif(1, 0xFFFFFF00u),            // next IFD far outside
-      rawExif(1, 0, true, 0x7FFFFFF0u),   // Exif IFD far outside
-      rawExif(6, 0, false, 0, 0xFFFF),    // 65535 entries claimed, one present
+      rawExif(1, 8),                     // IFD0 is its own next IFD
+      rawExif(1, 0, true, 8),            // the Exif IFD is IFD0 again
+      rawExif(1, 0xFFFFFF00u),           // next IFD far outside
+      rawExif(1, 0, true, 0x7FFFFFF0u),  // Exif IFD far outside
+      rawExif(6, 0, false, 0, 0xFFFF),   // 65535 entries claimed, one present
       {'E', 'x', 'i', 'f', 0, 0, 'M', 'M', 0, 42, 0xFF, 0xFF, 0xFF, 0xF0},  // IFD0 outside
   };
   for (size_t i = 0; i < blocks.size(); ++i) {
@@ -231,9 +232,7 @@ TEST_F(DecoderThread, BadFilesAndBrokenExif) {
   }
   EXPECT_TRUE(log.contains("Invalid listener"));
   // A thread never started is deleted without a join; one is never started twice.
-  {
-    CLyImageDecoderThread idle;
-  }
+  { CLyImageDecoderThread idle; }
   {
     CLyImageDecoderThread t;
     Collector once;

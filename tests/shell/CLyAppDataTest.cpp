@@ -101,6 +101,11 @@ TEST_F(CLyAppDataTest, ColourAndFontTablesAreAddedOnce) {
     if (std::string(static_cast<const char*>(item)).find("LyTheme.edj") != std::string::npos) found = true;
   }
   EXPECT_TRUE(found);
+  // The extension supplies the application layout desktop themes lack.
+  Evas_Object* win = pictavo::test::createTestWindow(100, 100);
+  Evas_Object* layout = elm_layout_add(win);
+  EXPECT_TRUE(elm_layout_theme_set(layout, "layout", "application", "default"));
+  evas_object_del(win);
   CLyAppData::destroyInstance();
   // Destroying the data takes the tables and the extension away.
   EXPECT_EQ(uxt_theme_get_color("AO013", &r, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, nullptr,

@@ -8,6 +8,8 @@
 #include <cstdlib>
 #include <ctime>
 #include <fstream>
+#include <iterator>
+#include <random>
 #include <regex>
 #include <string>
 
@@ -340,4 +342,25 @@ TEST(CLyUtilDeviceTest, ReplyThemeColourAndTouchSound) {
   EXPECT_FALSE(log.contains("feedback_play error"));
   EXPECT_EQ(feedback_get_play_count(), played + 1);
   feedback_deinitialize();
+}
+
+TEST(CLyUtilOrientationTest, DamagedExifNeverCrashes) {
+  TempDir dir;
+  ASSERT_TRUE(writeJpeg(dir.file("base.jpg"), ExifPlace::IFD0, 6));
+  std::ifstream in(dir.file("base.jpg"), std::ios::binary);
+  std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+  // The EXIF segment sits right after the start-of-image marker.
+  ASSERT_GT(bytes.size(), 64u);
+  std::mt19937 rng(1206);
+  int sixes = 0;
+  for (int round = 0; round < 600; ++round) {
+    std::string damaged = bytes;
+    for (int i = 0; i < 3; ++i) damaged[2 + rng() % 60] = static_cast<char>(rng() & 0xFF);
+    ASSERT_TRUE(pictavo::test::writeFileBytes(dir.file("damaged.jpg"), damaged));
+    int orientation = CLyUtil::getOrientation(dir.file("damaged.jpg"));
+    EXPECT_GE(orientation, -1);
+    EXPECT_LE(orientation, 0xFFFF);
+    if (orientation == 6) ++sixes;
+  }
+  EXPECT_GT(sixes, 0) << "mutations away from the tag leave it readable";
 }

@@ -20,10 +20,13 @@ CLyMultiGridSrcItem* itemOf(int w, int h) {
 std::string crop(const CLyMultiGridSrcItem& item) {
   const CLyRectangle* r = item.getSrcRect();
   if (!r) return "none";
-  return std::to_string(r->x) + "," + std::to_string(r->y) + "," + std::to_string(r->w) + "," + std::to_string(r->h);
+  return std::to_string(r->x) + "," + std::to_string(r->y) + "," + std::to_string(r->w) + "," +
+         std::to_string(r->h);
 }
 
-void setCrop(CLyMultiGridSrcItem& item, int l, int t, int r, int b) { item.setSrcRect(new CLyRectangle(l, t, r, b)); }
+void setCrop(CLyMultiGridSrcItem& item, int l, int t, int r, int b) {
+  item.setSrcRect(new CLyRectangle(l, t, r, b));
+}
 }  // namespace
 
 TEST(SrcItem, ConstructionAndInitialCrop) {
@@ -61,13 +64,13 @@ TEST(SrcItem, CheckRectInOrg) {
            std::to_string(rect.h);
   };
   EXPECT_EQ(fit(-10, 0, 90, 100), "0,0,100,100");
-  EXPECT_EQ(fit(10, 10, 110, 110), "10,10,110,110");     // inside: unchanged
-  EXPECT_EQ(fit(150, 20, 250, 120), "100,20,200,120");   // shifted left
-  EXPECT_EQ(fit(0, 150, 100, 260), "0,90,100,200");      // shifted up
-  EXPECT_EQ(fit(0, 0, 400, 200), "0,0,200,100");         // too wide: width 200, height in proportion
-  EXPECT_EQ(fit(50, 0, 150, 400), "50,0,100,200");       // too high: height 200, width in proportion
-  EXPECT_EQ(fit(0, -30, 100, 70), "0,0,100,70");         // top clipped without moving the bottom
-  EXPECT_EQ(fit(190, 0, 210, 20), "180,0,200,20");        // overhanging: moved, not enlarged
+  EXPECT_EQ(fit(10, 10, 110, 110), "10,10,110,110");    // inside: unchanged
+  EXPECT_EQ(fit(150, 20, 250, 120), "100,20,200,120");  // shifted left
+  EXPECT_EQ(fit(0, 150, 100, 260), "0,90,100,200");     // shifted up
+  EXPECT_EQ(fit(0, 0, 400, 200), "0,0,200,100");        // too wide: width 200, height in proportion
+  EXPECT_EQ(fit(50, 0, 150, 400), "50,0,100,200");      // too high: height 200, width in proportion
+  EXPECT_EQ(fit(0, -30, 100, 70), "0,0,100,70");        // top clipped without moving the bottom
+  EXPECT_EQ(fit(190, 0, 210, 20), "180,0,200,20");      // overhanging: moved, not enlarged
   for (int l = -300; l <= 300; l += 37) {
     for (int t = -300; t <= 300; t += 41) {
       CLyRectangle rect(l, t, l + 120, t + 90);
@@ -83,11 +86,11 @@ TEST(SrcItem, CheckRectInOrg) {
 
 TEST(SrcItem, PanFollowsTheFingerWithinTheBitmap) {
   std::unique_ptr<CLyMultiGridSrcItem> item(itemOf(4000, 3000));  // zoom 2
-  EXPECT_TRUE(item->pan(100, 40));  // moves 50, 20 bitmap pixels the other way
+  EXPECT_TRUE(item->pan(100, 40));                                // moves 50, 20 bitmap pixels the other way
   EXPECT_EQ(crop(*item), "950,730,2950,2230");
   EXPECT_TRUE(item->pan(-100000, 0));
   EXPECT_EQ(crop(*item), "2000,730,4000,2230");  // pulled back to the right edge, same size
-  EXPECT_FALSE(item->pan(-100, 0));               // nowhere further to go
+  EXPECT_FALSE(item->pan(-100, 0));              // nowhere further to go
   EXPECT_TRUE(item->pan(0, 100000));
   EXPECT_EQ(crop(*item), "2000,0,4000,1500");
   // At zoom 1 a movement is taken as it is.

@@ -97,10 +97,33 @@ TEST(CollageTouch, TapSelectsACellAndShowsItsFrameAndHandlers) {
   EXPECT_EQ(2, host.selections);
   EXPECT_EQ(downs, host.mouseDowns.size());
 
+  // A tap beside the collage reports the press on no cell and keeps the selection.
+  host.tap(20, 20);
+  host.spin(0.4);
+  ASSERT_FALSE(host.mouseDowns.empty());
+  EXPECT_EQ(std::make_pair(-1, false), host.mouseDowns.back());
+  EXPECT_EQ(1, grid->getCurrentIndex());
+
   EXPECT_TRUE(grid->clearSelection());
   EXPECT_EQ(-1, grid->getCurrentIndex());
   EXPECT_FALSE(anyGripVisible(grid));
   EXPECT_FALSE(grid->clearSelection());
+}
+
+TEST(CollageTouch, TheFrameFollowsTheControlWhenItIsLaidOutAgain) {
+  CollageHost host;
+  ASSERT_TRUE(host.ok());
+  CLyMultiGrid* grid = host.grid();
+  ASSERT_TRUE(host.select(0));
+  Evas_Object* boxImage = grid->getFocusBox()->getImageObject();
+  ASSERT_NE(nullptr, boxImage);
+  evas_object_resize(grid->getEvasObj(), 700, 1200);
+  host.spin(0.05);
+  int w = 0, h = 0;
+  evas_object_geometry_get(boxImage, nullptr, nullptr, &w, &h);
+  EXPECT_EQ(700, w);
+  EXPECT_EQ(1200, h);
+  EXPECT_TRUE(anyGripVisible(grid)) << "the frame of the selected cell is drawn again";
 }
 
 TEST(CollageTouch, NoSurfacesMeansNoInteraction) {
@@ -418,6 +441,32 @@ TEST(CollageTouch, SecondPressDropsTheFirstAndReleaseWithoutPressDrawsNothing) {
   EXPECT_EQ(1, host.addPictures);
   send(LY_GESTURE_MOUSE_UP, p0);
   EXPECT_EQ(1, host.addPictures) << "no effect left to release";
+}
+
+TEST(CollageTouch, ClearingTheSelectionDuringADragStillDropsThePhoto) {
+  CollageHost host;
+  ASSERT_TRUE(host.ok());
+  CLyMultiGrid* grid = host.grid();
+  ASSERT_TRUE(host.select(0));
+  const CLyPoint p0 = host.centre(0), p1 = host.centre(1);
+  host.down(p0.x, p0.y);
+  ASSERT_TRUE(
+      runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
+  EXPECT_TRUE(grid->clearSelection());
+  EXPECT_EQ(LY_MULTIGRID_MODE_DRAGGING, grid->getInteractionMode());
+  for (int i = 1; i <= 5; ++i) {
+    host.move(p0.x + (p1.x - p0.x) * i / 5, p0.y + (p1.y - p0.y) * i / 5);
+    host.spin(0.01);
+  }
+  host.up(p1.x, p1.y);
+  ASSERT_TRUE(runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_IDLE; }, 3.0));
+  ASSERT_EQ(1u, host.swaps.size());
+  EXPECT_EQ(std::make_pair(0, 1), host.swaps[0]);
+  // Both cells show photos again: nothing is left black.
+  Evas_Object* canvasImage = findCanvasImage(grid);
+  ASSERT_NE(nullptr, canvasImage);
+  EXPECT_NE(0xff000000u, canvasPixel(grid, canvasImage, p0.x, p0.y));
+  EXPECT_NE(0xff000000u, canvasPixel(grid, canvasImage, p1.x, p1.y));
 }
 
 }  // namespace

@@ -18,6 +18,7 @@ namespace {
 class PressAnimationTest : public ::testing::Test {
  protected:
   void SetUp() override {
+    pictavo::test::touch::setUnitScale();
     win = pictavo::test::createTestWindow(400, 400);
     image = evas_object_image_filled_add(evas_object_evas_get(win));
     evas_object_image_alpha_set(image, EINA_TRUE);

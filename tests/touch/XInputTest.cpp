@@ -1,7 +1,8 @@
 // The same gestures through a real X server: pointer input made by xdotool
 // reaches the collage through ecore-x and evas. Runs only when asked for
 // (PICTAVO_TOUCH_XDOTOOL=1) on an X11 engine, for example:
-//   Xvfb :97 & DISPLAY=:97 ELM_ENGINE=software_x11 PICTAVO_TOUCH_XDOTOOL=1 test_touch --gtest_filter='XInput*'
+//   Xvfb :97 & DISPLAY=:97 ELM_ENGINE=software_x11 PICTAVO_TOUCH_XDOTOOL=1 test_touch
+//   --gtest_filter='XInput*'
 
 #include <Elementary.h>
 #include <gtest/gtest.h>
@@ -24,7 +25,8 @@ namespace {
 bool wanted() {
   const char* flag = getenv("PICTAVO_TOUCH_XDOTOOL");
   const char* engine = getenv("ELM_ENGINE");
-  return flag && *flag == '1' && getenv("DISPLAY") && engine && std::string(engine).find("x11") != std::string::npos;
+  return flag && *flag == '1' && getenv("DISPLAY") && engine &&
+         std::string(engine).find("x11") != std::string::npos;
 }
 
 class XPointer {
@@ -83,7 +85,8 @@ TEST(XInput, TapPanAndLongPressSwapOnARealWindow) {
   ASSERT_TRUE(pointer.moveTo(p0.x, p0.y));
   host.spin(0.05);
   ASSERT_TRUE(pointer.down());
-  ASSERT_TRUE(runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
+  ASSERT_TRUE(
+      runMainLoopUntil([&]() { return grid->getInteractionMode() == LY_MULTIGRID_MODE_DRAGGING; }, 3.0));
   for (int i = 1; i <= 8; ++i) {
     ASSERT_TRUE(pointer.moveTo(p0.x + (p1.x - p0.x) * i / 8, p0.y + (p1.y - p0.y) * i / 8));
     host.spin(0.03);
