@@ -40,6 +40,7 @@ std::string selfDir() {
 }
 
 int runProcess(const std::vector<std::string>& args, bool quiet = true) {
+  fflush(nullptr);  // or the child repeats what is still buffered
   pid_t pid = fork();
   if (pid == 0) {
     if (quiet) {

@@ -18,8 +18,8 @@ struct Callback {
   void* data;
 };
 
-// The objects with key callbacks; `stamp` orders them by their last
-// registration or show, the latest one being on top.
+// The objects with key callbacks; `stamp` orders them by their first
+// registration or latest show, the latest one being on top.
 struct ObjectRecord {
   Evas_Object* obj;
   uint64_t stamp;
@@ -163,12 +163,11 @@ void eext_object_event_callback_add(Evas_Object* obj, Eext_Callback_Type type, E
   ensureCatcher(evas_object_evas_get(obj));
   ObjectRecord* record = findRecord(obj);
   if (!record) {
-    record = new ObjectRecord{obj, 0, {}};
+    record = new ObjectRecord{obj, ++gStamp, {}};
     gRecords.push_back(record);
     evas_object_event_callback_add(obj, EVAS_CALLBACK_SHOW, onObjectShow, nullptr);
     evas_object_event_callback_add(obj, EVAS_CALLBACK_DEL, onObjectDel, nullptr);
   }
-  record->stamp = ++gStamp;
   record->callbacks.push_back({type, func, data});
 }
 

@@ -5,9 +5,10 @@
 //   back  Escape, or XF86Back on keyboards that have a back key
 //   more  Menu, or XF86Menu
 //
-// Of all objects of a window with a callback for the pressed key, the one
-// registered or shown most recently that is visible gets the key; its
-// callbacks run in the order they were added.
+// Of all visible objects of a window with a callback for the pressed key,
+// the one shown (or first given a callback) most recently gets the key; its
+// callbacks run in the order they were added. A handled key is marked as
+// held, so widgets do not act on it a second time.
 
 #include <Evas.h>
 

@@ -60,15 +60,28 @@ void lumaOf(const Rgba& img, Gray& out) {
 void edgesOf(const Gray& l, Gray& out, int low, int high) {
   out.resize(l.w, l.h);
   auto at = [&l](int x, int y) -> int { return l.row(std::clamp(y, 0, l.h - 1))[std::clamp(x, 0, l.w - 1)]; };
+  auto strength = [low, high](int gx, int gy) {
+    return (uint8_t)clamp255((std::abs(gx) + std::abs(gy) - low) * 255 / (high - low));
+  };
   for (int y = 0; y < l.h; ++y) {
     uint8_t* d = out.row(y);
+    const bool inner = y > 0 && y < l.h - 1;
     for (int x = 0; x < l.w; ++x) {
+      if (inner && x > 0 && x < l.w - 1) {
+        // Inside: direct reads, no clamping.
+        const uint8_t* u = l.row(y - 1) + x;
+        const uint8_t* m = l.row(y) + x;
+        const uint8_t* b = l.row(y + 1) + x;
+        const int gx = u[1] + 2 * m[1] + b[1] - u[-1] - 2 * m[-1] - b[-1];
+        const int gy = b[-1] + 2 * b[0] + b[1] - u[-1] - 2 * u[0] - u[1];
+        d[x] = strength(gx, gy);
+        continue;
+      }
       const int gx = at(x + 1, y - 1) + 2 * at(x + 1, y) + at(x + 1, y + 1) - at(x - 1, y - 1) -
                      2 * at(x - 1, y) - at(x - 1, y + 1);
       const int gy = at(x - 1, y + 1) + 2 * at(x, y + 1) + at(x + 1, y + 1) - at(x - 1, y - 1) -
                      2 * at(x, y - 1) - at(x + 1, y - 1);
-      const int mag = std::abs(gx) + std::abs(gy);
-      d[x] = (uint8_t)clamp255((mag - low) * 255 / (high - low));
+      d[x] = strength(gx, gy);
     }
   }
 }

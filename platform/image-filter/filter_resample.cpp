@@ -144,11 +144,32 @@ void downscaleLuma(const Frame& f, int factor, Gray& out) {
 
 namespace {
 
+#if defined(__x86_64__)
+// The running sum of one row of four-channel pixels, the four sums in one
+// vector; the same integers as the plain loop.
+__attribute__((target("avx2"))) void rowRun4(const uint8_t* add, const uint8_t* sub, uint8_t* out, int w,
+                                             const uint32_t* start, uint32_t inv) {
+  const __m128i vinv = _mm_set1_epi32((int)inv), half = _mm_set1_epi32(1 << 23);
+  __m128i sum = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start));
+  for (int x = 0; x < w; ++x) {
+    __m128i o = _mm_srli_epi32(_mm_add_epi32(_mm_mullo_epi32(sum, vinv), half), 24);
+    o = _mm_packus_epi16(_mm_packus_epi32(o, o), o);
+    store32(out + (size_t)x * 4, (uint32_t)_mm_cvtsi128_si32(o));
+    const __m128i a = _mm_cvtepu8_epi32(_mm_cvtsi32_si128((int)load32(add + (size_t)x * 4)));
+    const __m128i b = _mm_cvtepu8_epi32(_mm_cvtsi32_si128((int)load32(sub + (size_t)x * 4)));
+    sum = _mm_sub_epi32(_mm_add_epi32(sum, a), b);
+  }
+}
+#endif
+
 template <int N>
 void blurRows(Image<N>& img, int r) {
   const int w = img.w;
   const uint32_t inv = (1u << 24) / (uint32_t)(2 * r + 1);
   std::vector<uint8_t> line((size_t)(w + 2 * r + 1) * N);
+#if defined(__x86_64__)
+  const bool avx2 = simdAvx2();
+#endif
   for (int y = 0; y < img.h; ++y) {
     uint8_t* row = img.row(y);
     // Edge pixels repeat beyond both ends.
@@ -161,6 +182,14 @@ void blurRows(Image<N>& img, int r) {
       for (int k = 0; k < N; ++k) sum[k] += line[(size_t)i * N + k];
     const uint8_t* add = line.data() + (size_t)(2 * r + 1) * N;
     const uint8_t* sub = line.data();
+#if defined(__x86_64__)
+    if constexpr (N == 4) {
+      if (avx2) {
+        rowRun4(add, sub, row, w, sum, inv);
+        continue;
+      }
+    }
+#endif
     for (int x = 0; x < w; ++x) {
       for (int k = 0; k < N; ++k) {
         row[(size_t)x * N + k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);

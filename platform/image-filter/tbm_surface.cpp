@@ -3,6 +3,7 @@
 #include <atomic>
 #include <cstdlib>
 #include <cstring>
+#include <mutex>
 #include <new>
 
 #include "platform/core/dlog.h"
@@ -19,6 +20,47 @@ struct _tbm_surface {
 };
 
 namespace {
+
+// Freed pixel blocks kept for the next surface of the same size, as the
+// platform's buffer manager keeps freed buffer objects: a filter run makes
+// two surfaces of one size, and fresh pages would be zeroed by the kernel
+// each time (as much work as the filter itself). Two blocks of at most
+// 32 MiB are kept, under a lock; surfaces are used from worker threads.
+constexpr size_t kPoolBlockMax = 32u << 20;
+struct PooledBlock {
+  unsigned char* pixels = nullptr;
+  size_t size = 0;
+};
+std::mutex gPoolMutex;
+PooledBlock gPool[2];
+
+unsigned char* takeBlock(size_t size) {
+  {
+    std::lock_guard<std::mutex> lock(gPoolMutex);
+    for (PooledBlock& b : gPool)
+      if (b.pixels && b.size == size) {
+        unsigned char* p = b.pixels;
+        b = PooledBlock{};
+        return p;
+      }
+  }
+  return static_cast<unsigned char*>(aligned_alloc(64, size));
+}
+
+void giveBlock(unsigned char* pixels, size_t size) {
+  if (size <= kPoolBlockMax) {
+    unsigned char* evicted = nullptr;
+    {
+      std::lock_guard<std::mutex> lock(gPoolMutex);
+      PooledBlock* slot = !gPool[0].pixels ? &gPool[0] : (!gPool[1].pixels ? &gPool[1] : &gPool[0]);
+      evicted = slot->pixels;
+      *slot = PooledBlock{pixels, size};
+    }
+    free(evicted);
+    return;
+  }
+  free(pixels);
+}
 
 bool supported(tbm_format format) {
   return format == TBM_FORMAT_ARGB8888 || format == TBM_FORMAT_BGRA8888;
@@ -54,7 +96,8 @@ tbm_surface_h tbm_surface_create(int width, int height, tbm_format format) {
   s->height = height;
   s->format = format;
   s->stride = ((uint32_t)width * 4 + 63) & ~63u;
-  s->pixels = static_cast<unsigned char*>(aligned_alloc(64, (size_t)s->stride * (size_t)height));
+  // aligned_alloc wants a multiple of the alignment: the stride is one.
+  s->pixels = takeBlock((size_t)s->stride * (size_t)height);
   if (!s->pixels) {
     dlog_print(DLOG_ERROR, TBM_TAG, "tbm_surface_create: out of memory for %dx%d", width, height);
     delete s;
@@ -65,7 +108,7 @@ tbm_surface_h tbm_surface_create(int width, int height, tbm_format format) {
 
 int tbm_surface_destroy(tbm_surface_h surface) {
   if (!surface) return TBM_SURFACE_ERROR_INVALID_PARAMETER;
-  free(surface->pixels);
+  giveBlock(surface->pixels, (size_t)surface->stride * (size_t)surface->height);
   delete surface;
   return TBM_SURFACE_ERROR_NONE;
 }

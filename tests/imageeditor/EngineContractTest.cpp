@@ -231,3 +231,16 @@ TEST(EngineContract, VectorAndPlainKernelsGiveTheSameBytes) {
       EXPECT_EQ(vector[i], plain[i]) << "effect " << offeredEffects()[i];
   }
 }
+
+TEST(EngineContract, SourceAndDestinationMayBeOneBuffer) {
+  const int w = 45, h = 31;
+  const auto src = makeImage(w, h, 19);
+  for (int format : {8, 9})
+    for (int effect : {3, 7, 14, 22, 35}) {
+      std::vector<uint8_t> same = src;
+      IeImageInfo s{w, h, (uint16_t)format, same.data()};
+      IeImageInfo d{w, h, 0, same.data()};
+      ASSERT_EQ(IE_Engine_Apply_Effect(&s, &d, effect), IE_ERROR_NONE);
+      EXPECT_EQ(same, apply(src, w, h, format, effect)) << format << "/" << effect;
+    }
+}

@@ -126,6 +126,18 @@ TEST(CollageTouch, TheFrameFollowsTheControlWhenItIsLaidOutAgain) {
   EXPECT_TRUE(anyGripVisible(grid)) << "the frame of the selected cell is drawn again";
 }
 
+TEST(CollageTouch, ADoubleTapSelectsLikeATap) {
+  CollageHost host;
+  ASSERT_TRUE(host.ok());
+  const CLyPoint p = host.centre(1);
+  host.tap(p.x, p.y);
+  host.tap(p.x, p.y);
+  ASSERT_TRUE(runMainLoopUntil([&]() { return host.selections > 0; }, 2.0));
+  host.spin(0.4);
+  EXPECT_EQ(1, host.grid()->getCurrentIndex());
+  EXPECT_EQ(1, host.selections) << "the second tap hits the selected cell";
+}
+
 TEST(CollageTouch, NoSurfacesMeansNoInteraction) {
   LogCapture log;
   CollageHost host;
