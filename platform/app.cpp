@@ -36,8 +36,11 @@ struct PostedRequest {
   app_control_h request;
 };
 
+// The window manager's view of a window, as its notifications tell it.
 struct WatchedWindow {
   Evas_Object* window;
+  bool iconified = false;
+  bool withdrawn = false;
   bool obscured = false;
 };
 
@@ -63,8 +66,7 @@ std::vector<app_event_handler*> gHandlers;
 const char* kWindowSignals[] = {"iconified", "normal", "withdrawn", "fully_obscured", "unobscured"};
 
 bool windowVisible(const WatchedWindow& watched) {
-  Evas_Object* win = watched.window;
-  return evas_object_visible_get(win) && !elm_win_iconified_get(win) && !elm_win_withdrawn_get(win) &&
+  return evas_object_visible_get(watched.window) && !watched.iconified && !watched.withdrawn &&
          !watched.obscured;
 }
 
@@ -91,6 +93,9 @@ WatchedWindow* findWatched(Evas_Object* win) {
 void onWindowSignal(void* data, Evas_Object* win, void*) {
   const char* signal = static_cast<const char*>(data);
   if (WatchedWindow* watched = findWatched(win)) {
+    if (strcmp(signal, "iconified") == 0) watched->iconified = true;
+    if (strcmp(signal, "withdrawn") == 0) watched->withdrawn = true;
+    if (strcmp(signal, "normal") == 0) watched->iconified = watched->withdrawn = false;
     if (strcmp(signal, "fully_obscured") == 0) watched->obscured = true;
     if (strcmp(signal, "unobscured") == 0) watched->obscured = false;
   }
@@ -337,7 +342,10 @@ bool ui_app_is_paused(void) {
 
 void ui_app_watch_window(Evas_Object* window) {
   if (!window || !gApp.running || findWatched(window)) return;
-  gApp.windows.push_back({window});
+  WatchedWindow watched{window};
+  watched.iconified = elm_win_iconified_get(window);
+  watched.withdrawn = elm_win_withdrawn_get(window);
+  gApp.windows.push_back(watched);
   for (const char* signal : kWindowSignals)
     evas_object_smart_callback_add(window, signal, onWindowSignal, signal);
   evas_object_event_callback_add(window, EVAS_CALLBACK_SHOW, onWindowShowHide, nullptr);

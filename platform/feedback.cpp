@@ -24,24 +24,19 @@ bool pathExists(const char* path) {
 }
 
 // The desktop's click sound through canberra-gtk-play, when a sound device
-// and the player are there; the player runs detached so a slow sound system
-// never holds up the touch.
+// and the player are there. A shell starts the player in the background and
+// exits at once, so a slow sound system never holds up the touch.
 bool playDesktopClick() {
   if (getenv("PICTAVO_NO_SOUND") || !pathExists("/dev/snd")) return false;
   static const char* kPlayer = "/usr/bin/canberra-gtk-play";
   if (access(kPlayer, X_OK) != 0) return false;
-  // Double fork so the player is never left as a zombie of this process.
-  pid_t child = fork();
-  if (child < 0) return false;
-  if (child == 0) {
-    pid_t grandchild = 0;
-    char* argv[] = {const_cast<char*>(kPlayer), const_cast<char*>("-i"), const_cast<char*>("button-pressed"),
-                    nullptr};
-    posix_spawn(&grandchild, kPlayer, nullptr, nullptr, argv, environ);
-    _exit(0);
-  }
+  pid_t shell = 0;
+  char* argv[] = {const_cast<char*>("sh"), const_cast<char*>("-c"),
+                  const_cast<char*>("\"$0\" -i button-pressed </dev/null >/dev/null 2>&1 &"),
+                  const_cast<char*>(kPlayer), nullptr};
+  if (posix_spawn(&shell, "/bin/sh", nullptr, nullptr, argv, environ) != 0) return false;
   int status = 0;
-  waitpid(child, &status, 0);
+  waitpid(shell, &status, 0);
   return true;
 }
 

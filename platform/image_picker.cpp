@@ -301,13 +301,10 @@ int image_picker_launch(app_control_h request, const std::shared_ptr<app_control
   app_control_launch_mode_e mode = APP_CONTROL_LAUNCH_MODE_SINGLE;
   app_control_get_launch_mode(request, &mode);
   if (!buildWindow(session, mode)) {
+    // Only the window itself can fail, before anything refers to the session.
     LYLOG_E("Cannot open the picker window");
-    if (session->window)
-      evas_object_del(session->window);  // frees the session
-    else {
-      app_control_destroy(request);
-      delete session;
-    }
+    app_control_destroy(request);
+    delete session;
     return APP_CONTROL_ERROR_LAUNCH_FAILED;
   }
   if (gOpen && gOpen != session) LYLOG_W("a second picker opens while one is open");

@@ -18,8 +18,10 @@ std::mutex gMutex;
 std::vector<std::string> gPosted;
 Evas_Object* gWindow = nullptr;
 
-void onWindowDel(void*, Evas*, Evas_Object* obj, void*) {
-  if (gWindow == obj) gWindow = nullptr;
+// Watched at the object level: evas holds back the DEL callback of an object
+// whose events are frozen (as while another application starts).
+void onWindowDel(void*, const Efl_Event* event) {
+  if (gWindow == event->object) gWindow = nullptr;
 }
 
 void onToastTimeout(void*, Evas_Object* popup, void*) {
@@ -47,9 +49,9 @@ void showToast(Evas_Object* window, const char* message) {
 }  // namespace
 
 extern "C" void notification_set_window(Evas_Object* window) {
-  if (gWindow) evas_object_event_callback_del(gWindow, EVAS_CALLBACK_DEL, onWindowDel);
+  if (gWindow) efl_event_callback_del(gWindow, EFL_EVENT_DEL, onWindowDel, nullptr);
   gWindow = window;
-  if (gWindow) evas_object_event_callback_add(gWindow, EVAS_CALLBACK_DEL, onWindowDel, nullptr);
+  if (gWindow) efl_event_callback_add(gWindow, EFL_EVENT_DEL, onWindowDel, nullptr);
 }
 
 extern "C" Evas_Object* notification_get_window(void) {

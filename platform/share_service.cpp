@@ -7,6 +7,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <string>
@@ -34,19 +35,22 @@ std::string findInPath(const char* program) {
   return "";
 }
 
-// Starts `program file` detached (double fork: no zombie is left behind and
-// the opener may outlive this process).
+// Starts `program file` detached: a shell puts it in the background and
+// exits at once, so nothing is left to reap and the opener may outlive this
+// process. The names go to the shell as positional arguments, never as
+// command text. (posix_spawn only: forking a threaded process is not safe.)
 bool spawnDetached(const std::string& program, const std::string& file) {
-  pid_t child = fork();
-  if (child < 0) return false;
-  if (child == 0) {
-    pid_t grandchild = 0;
-    char* argv[] = {const_cast<char*>(program.c_str()), const_cast<char*>(file.c_str()), nullptr};
-    int rc = posix_spawn(&grandchild, program.c_str(), nullptr, nullptr, argv, environ);
-    _exit(rc == 0 ? 0 : 1);
-  }
+  pid_t shell = 0;
+  char* argv[] = {const_cast<char*>("sh"),
+                  const_cast<char*>("-c"),
+                  const_cast<char*>("\"$0\" \"$1\" </dev/null >/dev/null 2>&1 &"),
+                  const_cast<char*>(program.c_str()),
+                  const_cast<char*>(file.c_str()),
+                  nullptr};
+  if (posix_spawn(&shell, "/bin/sh", nullptr, nullptr, argv, environ) != 0) return false;
   int status = 0;
-  if (waitpid(child, &status, 0) != child) return false;
+  // The main loop's own child reaper may have collected the shell first.
+  if (waitpid(shell, &status, 0) != shell) return errno == ECHILD;
   return WIFEXITED(status) && WEXITSTATUS(status) == 0;
 }
 

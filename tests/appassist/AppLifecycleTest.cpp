@@ -166,6 +166,7 @@ TEST(AppLifecycle, HidingTheWindowPausesAndClosesTheMenuFirst) {
   TestApp app;
   WViewControllerWeakPtr menu;
   bool menuOpenAtPause = true;
+  bool iconifyPaused = false;
   app.control = [&](TestApp& self, app_control_h, bool) {
     Evas_Object* win = self.getWindowController()->getEvasObj();
     auto* m = new WMenuPopupController();
@@ -178,13 +179,23 @@ TEST(AppLifecycle, HidingTheWindowPausesAndClosesTheMenuFirst) {
     evas_object_hide(win);  // already paused: no second pause
     evas_object_show(win);
     EXPECT_FALSE(ui_app_is_paused());
+    // Iconified by the window manager, then restored (the buffer engine has
+    // no window manager: its notifications are raised by hand).
+    elm_win_iconified_set(win, EINA_TRUE);
+    evas_object_smart_callback_call(win, "iconified", nullptr);
+    iconifyPaused = ui_app_is_paused();
+    elm_win_iconified_set(win, EINA_FALSE);
+    evas_object_smart_callback_call(win, "normal", nullptr);
+    EXPECT_FALSE(ui_app_is_paused());
     ui_app_exit();
   };
   app.pause = [&](TestApp&) { menuOpenAtPause = WMenuPopupController::getCurrentMenu() != nullptr; };
   EXPECT_EQ(runApp(app, {"pictavo"}), APP_ERROR_NONE);
   EXPECT_FALSE(menuOpenAtPause);
   EXPECT_TRUE(menu.expired());
-  EXPECT_EQ(app.calls, (std::vector<std::string>{"create", "first-control", "pause", "resume", "terminate"}));
+  EXPECT_TRUE(iconifyPaused);
+  EXPECT_EQ(app.calls, (std::vector<std::string>{"create", "first-control", "pause", "resume", "pause",
+                                                 "resume", "terminate"}));
   app.cleanUp();
 }
 

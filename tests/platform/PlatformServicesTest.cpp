@@ -209,6 +209,13 @@ TEST(NotificationTest, PostedTextsAreKeptAndToastedOnTheWindow) {
   EXPECT_EQ(notification_get_posted_count(), 2u);
   notification_clear_posted();
   EXPECT_EQ(notification_get_posted_count(), 0u);
+
+  // Also a window deleted while its events are frozen.
+  Evas_Object* frozen = pictavo::test::createTestWindow(100, 100);
+  notification_set_window(frozen);
+  evas_object_freeze_events_set(frozen, EINA_TRUE);
+  evas_object_del(frozen);
+  EXPECT_EQ(notification_get_window(), nullptr);
 }
 
 TEST(FeedbackTest, PlayNeedsInitialisation) {
