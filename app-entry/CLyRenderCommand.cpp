@@ -1,13 +1,16 @@
 #include "app-entry/CLyRenderCommand.h"
 
+#include <Efreet.h>
 #include <Elementary.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <ctime>
 #include <memory>
 #include <mutex>
 #include <string>
@@ -15,8 +18,10 @@
 
 #include "app-assist/WWindowController.h"
 #include "codec/Bitmap.h"
+#include "codec/BitmapFactory.h"
 #include "common/CLyAppData.h"
 #include "common/CLyLog.h"
+#include "common/CLyUtil.h"
 #include "control/CLyMultiGrid.h"
 #include "control/CLyMultiGridSaver.h"
 #include "model/CLyImageDecoderThread.h"
@@ -35,14 +40,22 @@ class StepTimer {
   void mark(const char* step) {
     if (!mOn) return;
     auto now = std::chrono::steady_clock::now();
-    fprintf(stderr, "pictavo: %-8s %7.1f ms\n", step,
-            std::chrono::duration<double, std::milli>(now - mLast).count());
+    const double cpu = threadCpuMs();
+    fprintf(stderr, "pictavo: %-8s %7.1f ms (main thread CPU %5.1f ms)\n", step,
+            std::chrono::duration<double, std::milli>(now - mLast).count(), cpu - mLastCpu);
     mLast = now;
+    mLastCpu = cpu;
   }
 
  private:
+  static double threadCpuMs() {
+    timespec t{};
+    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &t);
+    return t.tv_sec * 1e3 + t.tv_nsec / 1e6;
+  }
   bool mOn;
   std::chrono::steady_clock::time_point mLast;
+  double mLastCpu = threadCpuMs();
 };
 
 StepTimer& stepTimer() {
@@ -181,6 +194,10 @@ class DecodeResults : public ILyMultiGridListener {
     delete mBitmaps[index];
     mBitmaps[index] = bitmap;
   }
+  bool has(size_t i) {
+    std::lock_guard<std::mutex> lock(mMutex);
+    return mBitmaps[i] != nullptr;
+  }
   Bitmap* take(size_t i) {
     std::lock_guard<std::mutex> lock(mMutex);
     Bitmap* b = mBitmaps[i];
@@ -193,16 +210,59 @@ class DecodeResults : public ILyMultiGridListener {
   std::vector<Bitmap*> mBitmaps;
 };
 
-// Decodes every photo on its own thread, bounded by the screen size ordered
-// so that width <= height, like the main view. The threads run while the
-// main thread brings up the toolkit and reads the layouts.
+// How the photos are decoded for this one save. The saved picture's size
+// follows the largest photo as the screen would show it (the screen size
+// ordered so that width <= height, like the main view), but each photo is
+// decoded only as large as its cell in the saved picture needs: a 12 MP
+// photo in a sixth of a 2000 x 2000 collage is decoded at 3/8, not at 1/2.
+struct DecodePlan {
+  float maxW = 0, maxH = 0;
+  int longestSide = 0;                // 0 when no photo could be read
+  std::vector<float> coverW, coverH;  // per photo; 0 for no cell
+};
+
+DecodePlan planDecoding(const Options& o) {
+  DecodePlan plan;
+  plan.maxW = (float)std::min(o.screenW, o.screenH);
+  plan.maxH = (float)std::max(o.screenW, o.screenH);
+  const size_t n = o.photos.size();
+  plan.coverW.assign(n, 0.0f);
+  plan.coverH.assign(n, 0.0f);
+  for (const std::string& photo : o.photos) {
+    DecodeOptions header;
+    if (BitmapFactory::parseImage(photo, header) != 1 || header.outWidth < 1 || header.outHeight < 1)
+      continue;
+    int w = 0, h = 0;
+    CLyImageDecoderThread::computeTarget(header.outWidth, header.outHeight, CLyUtil::getOrientation(photo),
+                                         plan.maxW, plan.maxH, &w, &h);
+    plan.longestSide = std::max(plan.longestSide, std::max(w, h));
+  }
+  CLyMultiGridStyleManager* styles = &CLyMultiGridStyleManager::getInstance();
+  if (styles->getGridLayoutCount(2) == 0 && !styles->initialize()) return plan;  // render() reports it
+  int saveW = 0, saveH = 0;
+  if ((int)n > kMaxPhotos || o.layout >= styles->getGridLayoutCount((int)n) ||
+      !CLyMultiGrid::computeSaveSize(plan.longestSide, o.ratio, kSaveLimit, saveW, saveH))
+    return plan;
+  float rects[kMaxPhotos][4] = {};
+  if (!styles->getDrawRects((int)n, o.ratio, o.layout, rects)) return plan;
+  // Cells are left, top, right, bottom fractions of the picture; margins
+  // only make them smaller, so the whole fraction always covers.
+  for (size_t i = 0; i < n; i++) {
+    plan.coverW[i] = std::max(0.0f, rects[i][2] - rects[i][0]) * saveW;
+    plan.coverH[i] = std::max(0.0f, rects[i][3] - rects[i][1]) * saveH;
+  }
+  return plan;
+}
+
+// Decodes every photo on its own thread. The threads run while the main
+// thread brings up the toolkit and the window.
 class PhotoDecoder {
  public:
-  explicit PhotoDecoder(const Options& o) : mResults(o.photos.size()) {
-    const float maxW = (float)std::min(o.screenW, o.screenH), maxH = (float)std::max(o.screenW, o.screenH);
+  PhotoDecoder(const Options& o, const DecodePlan& plan) : mResults(o.photos.size()) {
     for (size_t i = 0; i < o.photos.size(); i++) {
       auto t = std::make_unique<CLyImageDecoderThread>();
-      t->setMaxDecodingSize(maxW, maxH);
+      t->setMaxDecodingSize(plan.maxW, plan.maxH);
+      t->setCoverSize(plan.coverW[i], plan.coverH[i]);
       t->set((int)i, o.photos[i], &mResults);
       mThreads.push_back(std::move(t));
     }
@@ -217,7 +277,7 @@ class PhotoDecoder {
   std::vector<std::unique_ptr<CLyImageDecoderThread>> mThreads;
 };
 
-int render(const Options& o, PhotoDecoder& decoder) {
+int render(const Options& o, const DecodePlan& plan, PhotoDecoder& decoder) {
   CLyMultiGridStyleManager* styles = &CLyMultiGridStyleManager::getInstance();
   if (styles->getGridLayoutCount(2) == 0 && !styles->initialize()) {
     fprintf(stderr, "pictavo: the layout styles could not be read\n");
@@ -235,9 +295,23 @@ int render(const Options& o, PhotoDecoder& decoder) {
 
   decoder.join();
   stepTimer().mark("decode");
+  // A photo that could not be decoded leaves fewer photos, thus other cells,
+  // which the planned sizes may not cover: decode the rest again, for the
+  // screen, as if there had been no plan.
+  bool planned = plan.longestSide > 0;
+  std::unique_ptr<PhotoDecoder> again;
+  for (size_t i = 0; i < o.photos.size() && planned; i++) planned = decoder.results().has(i);
+  if (!planned && plan.longestSide > 0) {
+    DecodePlan screen = plan;
+    std::fill(screen.coverW.begin(), screen.coverW.end(), 0.0f);
+    std::fill(screen.coverH.begin(), screen.coverH.end(), 0.0f);
+    again = std::make_unique<PhotoDecoder>(o, screen);
+    again->join();
+  }
+  DecodeResults& results = again ? again->results() : decoder.results();
   CLyMultiGridSrcItemList items;
   for (size_t i = 0; i < o.photos.size(); i++) {
-    Bitmap* bitmap = decoder.results().take(i);
+    Bitmap* bitmap = results.take(i);
     if (!bitmap) {
       fprintf(stderr, "pictavo: skipping %s: not a photo that can be decoded\n", o.photos[i].c_str());
       continue;
@@ -279,6 +353,7 @@ int render(const Options& o, PhotoDecoder& decoder) {
     request.roundness = o.roundness;
     request.background = o.background;
     request.limit = kSaveLimit;
+    request.longestSide = planned ? plan.longestSide : 0;
     int w = 0, h = 0;
     Evas_Object* parent = window->getBaseLayout() ? window->getBaseLayout() : window->getEvasObj();
     if (CLyMultiGridSaver::save(window->getEvasObj(), parent, request, o.out, &w, &h)) {
@@ -317,13 +392,19 @@ int runRenderCommand(int argc, char** argv) {
   // any decoder thread asks for it: its lazy creation is not thread-safe.
   CLyAppData::getInstance();
   // Decoding starts first: it is the longest step and needs no toolkit.
-  PhotoDecoder decoder(o);
+  const DecodePlan plan = planDecoding(o);
+  stepTimer().mark("plan");
+  PhotoDecoder decoder(o, plan);
+  // Nothing here looks up desktop files, icons or MIME types: without this
+  // the toolkit starts the efreet daemon, which builds its caches in three
+  // more processes, all competing with the decoding for the CPU.
+  efreet_cache_disable();
   if (!elm_init(argc, argv)) {
     fprintf(stderr, "pictavo: the toolkit could not start\n");
     return LY_RENDER_FAILED;
   }
   stepTimer().mark("elm_init");
-  status = render(o, decoder);
+  status = render(o, plan, decoder);
   decoder.join();
   elm_shutdown();
   return status;

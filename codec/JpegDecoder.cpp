@@ -147,6 +147,26 @@ bool decodeJpeg(FILE* file, int outW, int outH, uint8_t* out) {
     jpeg_start_decompress(&cinfo);
     const int w = static_cast<int>(cinfo.output_width);
     const int h = static_cast<int>(cinfo.output_height);
+    if (!cmyk && w == outW && h == outH) {
+      // The DCT scale gives the target size itself: libjpeg writes straight
+      // into the output, with no row buffer and no copy. Rows a short file
+      // never delivers are made transparent, like the resampler's finish().
+      JSAMPROW pointers[16];
+      const int batch =
+          cinfo.rec_outbuf_height > 0 && cinfo.rec_outbuf_height < 16 ? cinfo.rec_outbuf_height : 1;
+      while (cinfo.output_scanline < cinfo.output_height) {
+        const int y = static_cast<int>(cinfo.output_scanline);
+        const int n = batch < h - y ? batch : h - y;
+        for (int i = 0; i < n; ++i) pointers[i] = out + static_cast<size_t>(y + i) * w * 4;
+        if (jpeg_read_scanlines(&cinfo, pointers, static_cast<JDIMENSION>(n)) == 0) break;
+      }
+      const size_t done = cinfo.output_scanline;
+      if (done < static_cast<size_t>(h))
+        memset(out + done * w * 4, 0, (static_cast<size_t>(h) - done) * w * 4);
+      jpeg_abort_decompress(&cinfo);
+      delete job;
+      return true;
+    }
     const int batch = cinfo.rec_outbuf_height > 0 ? cinfo.rec_outbuf_height : 1;
     job->resampler = new (std::nothrow) Resampler(w, h, outW, outH, out);
     job->rows = static_cast<uint8_t*>(malloc(static_cast<size_t>(w) * 4 * batch));

@@ -1,5 +1,7 @@
 #include "common/CLyCairoCanvas.h"
 
+#include <sys/mman.h>
+
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
@@ -88,6 +90,17 @@ cairo_surface_t* boxReduce(cairo_surface_t* surface, int x, int y, int w, int h,
   }
   cairo_surface_mark_dirty(out);
   return out;
+}
+
+// A large canvas (16 MB for a 2000 x 2000 save) is first written by the
+// drawing: asking for transparent huge pages over its 2 MiB-aligned interior
+// turns thousands of page faults into a few. Only a hint.
+void adviseHugePages(void* data, size_t size) {
+  constexpr uintptr_t kHuge = 2u << 20;
+  if (size < 4 * kHuge) return;
+  const uintptr_t begin = ((uintptr_t)data + kHuge - 1) & ~(kHuge - 1);
+  const uintptr_t end = ((uintptr_t)data + size) & ~(kHuge - 1);
+  if (end > begin) madvise((void*)begin, end - begin, MADV_HUGEPAGE);
 }
 
 }  // namespace
@@ -214,6 +227,7 @@ void CLyCairoCanvas::_createSurface() {
   int stride = evas_object_image_stride_get(mImage);
   if (stride < cairo_format_stride_for_width(CAIRO_FORMAT_ARGB32, w))
     stride = cairo_format_stride_for_width(CAIRO_FORMAT_ARGB32, w);
+  adviseHugePages(data, (size_t)stride * h);
   mSurface = cairo_image_surface_create_for_data(data, CAIRO_FORMAT_ARGB32, w, h, stride);
   mContext = cairo_create(mSurface);
   evas_object_image_data_set(mImage, data);
@@ -266,6 +280,23 @@ void CLyCairoCanvas::clearRect(const CLyFloatRectangle& rect) {
   cairo_restore(mContext);
 }
 
+void CLyCairoCanvas::clearRegion(const cairo_region_t* region) {
+  if (!mContext || !region || cairo_region_is_empty(region)) return;
+  cairo_save(mContext);
+  cairo_set_operator(mContext, CAIRO_OPERATOR_CLEAR);
+  cairo_new_path(mContext);
+  const int n = cairo_region_num_rectangles(region);
+  for (int i = 0; i < n; i++) {
+    cairo_rectangle_int_t r;
+    cairo_region_get_rectangle(region, i, &r);
+    cairo_rectangle(mContext, r.x - mGeometry.x, r.y - mGeometry.y, r.width, r.height);
+  }
+  // Pixel-aligned boxes: cairo fills them straight, no coverage mask.
+  cairo_fill(mContext);
+  _flushGl();
+  cairo_restore(mContext);
+}
+
 void CLyCairoCanvas::update() {
   _flushGl();
   if (mSurface && !mUseGl) cairo_surface_flush(mSurface);
@@ -275,9 +306,12 @@ void CLyCairoCanvas::update() {
 void CLyCairoCanvas::update(const CLyFloatRectangle& rect) {
   _flushGl();
   if (mSurface && !mUseGl) cairo_surface_flush(mSurface);
-  if (mImage)
-    evas_object_image_data_update_add(mImage, (int)(rect.x1 - mGeometry.x), (int)(rect.y1 - mGeometry.y),
-                                      (int)rect.x2, (int)rect.y2);
+  if (!mImage || !(rect.x2 > 0) || !(rect.y2 > 0)) return;
+  // Every pixel the rectangle touches, also the partly covered edge pixels.
+  const double l = rect.x1 - mGeometry.x, t = rect.y1 - mGeometry.y;
+  const int x0 = (int)std::floor(l), y0 = (int)std::floor(t);
+  const int x1 = (int)std::ceil(l + rect.x2), y1 = (int)std::ceil(t + rect.y2);
+  evas_object_image_data_update_add(mImage, x0, y0, x1 - x0, y1 - y0);
 }
 
 // ---------------------------------------------------------------- paths
@@ -538,4 +572,137 @@ void CLyCairoCanvas::drawBitmap(Bitmap* bitmap, const CLyFloatRectangle& dst) {
   cairo_matrix_translate(&m, -(dst.x1 - mGeometry.x), -(dst.y1 - mGeometry.y));
   _setSourcePattern(surface, m);
   cairo_surface_destroy(surface);
+}
+
+// ---------------------------------------------------------------- nearest copy
+
+bool CLyCairoCanvas::_canCopyNearest(cairo_surface_t* surface) const {
+  if (mUseGl || !mContext || !mSurface || !surface) return false;
+  if (mFilter != CAIRO_FILTER_FAST && mFilter != CAIRO_FILTER_NEAREST) return false;
+  if (cairo_get_operator(mContext) != CAIRO_OPERATOR_SOURCE) return false;
+  if (cairo_surface_get_type(mSurface) != CAIRO_SURFACE_TYPE_IMAGE ||
+      cairo_image_surface_get_format(mSurface) != CAIRO_FORMAT_ARGB32 ||
+      cairo_surface_get_type(surface) != CAIRO_SURFACE_TYPE_IMAGE ||
+      cairo_image_surface_get_format(surface) != CAIRO_FORMAT_ARGB32 ||
+      cairo_surface_status(surface) != CAIRO_STATUS_SUCCESS)
+    return false;
+  cairo_matrix_t ctm;
+  cairo_get_matrix(mContext, &ctm);
+  if (ctm.xx != 1 || ctm.yy != 1 || ctm.xy != 0 || ctm.yx != 0 || ctm.x0 != 0 || ctm.y0 != 0) return false;
+  // A clip set by a caller must be honoured: copy only on an unclipped canvas.
+  double cx1 = 0, cy1 = 0, cx2 = 0, cy2 = 0;
+  cairo_clip_extents(mContext, &cx1, &cy1, &cx2, &cy2);
+  return cx1 <= 0 && cy1 <= 0 && cx2 >= cairo_image_surface_get_width(mSurface) &&
+         cy2 >= cairo_image_surface_get_height(mSurface);
+}
+
+// Copies the pixels of `area` (canvas coordinates, inside the canvas) from
+// the part `src` of the surface stretched onto `dst`, sampling the texel
+// under each pixel centre like pixman's nearest filter with PAD extension.
+void CLyCairoCanvas::_copyNearest(cairo_surface_t* surface, const CLyFloatRectangle& dst,
+                                  const CLyRectangle& src, const cairo_region_t* area) {
+  cairo_surface_flush(surface);
+  cairo_surface_flush(mSurface);
+  const int sw = cairo_image_surface_get_width(surface), sh = cairo_image_surface_get_height(surface);
+  const int sstride = cairo_image_surface_get_stride(surface);
+  const unsigned char* sdata = cairo_image_surface_get_data(surface);
+  unsigned char* ddata = cairo_image_surface_get_data(mSurface);
+  const int dstride = cairo_image_surface_get_stride(mSurface);
+  if (!sdata || !ddata) return;
+  const double sx = src.w / (double)dst.x2, sy = src.h / (double)dst.y2;
+  const double ox = dst.x1 - mGeometry.x, oy = dst.y1 - mGeometry.y;
+  // pixman rounds a centre lying exactly on a texel edge down.
+  const double e = 1.0 / 65536;
+  auto texel = [e](double u, int size) {
+    const long i = (long)std::floor(u - e);
+    return (int)std::min<long>(std::max<long>(i, 0), size - 1);
+  };
+  cairo_rectangle_int_t ext;
+  cairo_region_get_extents(area, &ext);
+  if (ext.width <= 0 || ext.height <= 0) return;
+  std::vector<int> xmap((size_t)ext.width);
+  for (int x = 0; x < ext.width; x++) xmap[(size_t)x] = texel(src.x + sx * (ext.x + x + 0.5 - ox), sw);
+  const int n = cairo_region_num_rectangles(area);
+  for (int i = 0; i < n; i++) {
+    cairo_rectangle_int_t r;
+    cairo_region_get_rectangle(area, i, &r);
+    const int* xm = xmap.data() + (r.x - ext.x);
+    int lastRow = -1;
+    const uint32_t* lastDst = nullptr;
+    for (int y = r.y; y < r.y + r.height; y++) {
+      const int row = texel(src.y + sy * (y + 0.5 - oy), sh);
+      uint32_t* d = reinterpret_cast<uint32_t*>(ddata + (size_t)y * dstride) + r.x;
+      if (row == lastRow) {
+        // Enlarged photo: this row shows the same texels as the one above.
+        std::copy(lastDst, lastDst + r.width, d);
+      } else {
+        const uint32_t* s = reinterpret_cast<const uint32_t*>(sdata + (size_t)row * sstride);
+#pragma GCC unroll 4
+        for (int x = 0; x < r.width; x++) d[x] = s[xm[x]];
+      }
+      lastRow = row;
+      lastDst = d;
+    }
+  }
+  cairo_surface_mark_dirty_rectangle(mSurface, ext.x, ext.y, ext.width, ext.height);
+}
+
+void CLyCairoCanvas::drawBitmapInRoundRect(cairo_surface_t* surface, const CLyFloatRectangle& dst,
+                                           const CLyRectangle& src, double radius) {
+  if (!mContext) return;
+  if (!_canCopyNearest(surface) || dst.x2 <= 0 || dst.y2 <= 0 || src.w <= 0 || src.h <= 0) {
+    beginPath();
+    setRoundRectPath(dst, radius, radius);
+    drawBitmap(surface, dst, src);
+    return;
+  }
+  // Canvas coordinates from here on.
+  const double l = dst.x1 - mGeometry.x, t = dst.y1 - mGeometry.y;
+  const double r = l + dst.x2, b = t + dst.y2;
+  double rx = 0, ry = 0;
+  if (radius > 0) {
+    rx = std::min(radius, dst.x2 * 0.5);
+    ry = std::min(radius, dst.y2 * 0.5);
+  }
+  const cairo_rectangle_int_t canvas = {0, 0, cairo_image_surface_get_width(mSurface),
+                                        cairo_image_surface_get_height(mSurface)};
+  // Whole pixels inside the path: the inner pixels without the corners.
+  cairo_region_t* inside = cairo_region_create();
+  auto addInner = [inside](double x0, double y0, double x1, double y1) {
+    const int ix0 = (int)std::ceil(x0), iy0 = (int)std::ceil(y0);
+    const int ix1 = (int)std::floor(x1), iy1 = (int)std::floor(y1);
+    if (ix1 <= ix0 || iy1 <= iy0) return;
+    const cairo_rectangle_int_t c = {ix0, iy0, ix1 - ix0, iy1 - iy0};
+    cairo_region_union_rectangle(inside, &c);
+  };
+  addInner(l, t + ry, r, b - ry);
+  if (rx > 0 && ry > 0) addInner(l + rx, t, r - rx, b);
+  cairo_region_intersect_rectangle(inside, &canvas);
+  // Every pixel the path touches; what is not inside is the edge for cairo.
+  const int ox0 = (int)std::floor(l), oy0 = (int)std::floor(t);
+  const cairo_rectangle_int_t outer = {ox0, oy0, (int)std::ceil(r) - ox0, (int)std::ceil(b) - oy0};
+  cairo_region_t* edge = cairo_region_create_rectangle(&outer);
+  cairo_region_intersect_rectangle(edge, &canvas);
+  cairo_region_subtract(edge, inside);
+
+  if (!cairo_region_is_empty(inside)) _copyNearest(surface, dst, src, inside);
+  if (!cairo_region_is_empty(edge)) {
+    cairo_save(mContext);
+    cairo_new_path(mContext);
+    const int n = cairo_region_num_rectangles(edge);
+    for (int i = 0; i < n; i++) {
+      cairo_rectangle_int_t e;
+      cairo_region_get_rectangle(edge, i, &e);
+      cairo_rectangle(mContext, e.x, e.y, e.width, e.height);
+    }
+    cairo_clip(mContext);
+    beginPath();
+    setRoundRectPath(dst, radius, radius);
+    drawBitmap(surface, dst, src);
+    cairo_restore(mContext);
+  } else {
+    cairo_new_path(mContext);
+  }
+  cairo_region_destroy(edge);
+  cairo_region_destroy(inside);
 }

@@ -74,20 +74,38 @@ struct _CLyFocusBoxImpl {
   CLyPoint lastPos;
   CLyRectangle boxRect;
   int pressedGrip = -1;
-  // Region painted since the last clear (x, y, w, h), for clearFrame.
+  // Region painted since the last clear (x, y, w, h), for clearFrame, and a
+  // hole inside it that no paint touched (a frame leaves its inside alone:
+  // wiping only the band keeps a handler drag from clearing a whole cell's
+  // area on every step).
   CLyFloatRectangle painted;
   bool hasPainted = false;
+  CLyFloatRectangle hole;
+  bool hasHole = false;
 
-  void addPainted(const CLyFloatRectangle& r) {
+  void addPainted(const CLyFloatRectangle& r, const CLyFloatRectangle* untouched = nullptr) {
+    const bool holed = untouched && untouched->x2 > 0 && untouched->y2 > 0;
     if (!hasPainted) {
       painted = r;
       hasPainted = true;
+      hasHole = holed;
+      if (holed) hole = *untouched;
       return;
     }
     const float x1 = std::min(painted.x1, r.x1), y1 = std::min(painted.y1, r.y1);
     const float x2 = std::max(painted.x1 + painted.x2, r.x1 + r.x2);
     const float y2 = std::max(painted.y1 + painted.y2, r.y1 + r.y2);
     painted = CLyFloatRectangle(x1, y1, x2 - x1, y2 - y1);
+    if (!hasHole || !holed) {
+      hasHole = false;
+      return;
+    }
+    // Only what every paint left alone stays untouched.
+    const float hx1 = std::max(hole.x1, untouched->x1), hy1 = std::max(hole.y1, untouched->y1);
+    const float hx2 = std::min(hole.x1 + hole.x2, untouched->x1 + untouched->x2);
+    const float hy2 = std::min(hole.y1 + hole.y2, untouched->y1 + untouched->y2);
+    hasHole = hx2 > hx1 && hy2 > hy1;
+    if (hasHole) hole = CLyFloatRectangle(hx1, hy1, hx2 - hx1, hy2 - hy1);
   }
 };
 
@@ -271,7 +289,11 @@ void CLyFocusBox::show(const CLyFloatRectangle& rect, int roundness) {
   // rectangle, so the dirty region reaches a line width around it.
   const CLyFloatRectangle region(rect.x1 - line, rect.y1 - line, rect.x2 + 2 * line, rect.y2 + 2 * line);
   _pImpl->canvas->update(region);
-  _pImpl->addPainted(region);
+  // The stroke reaches half a line inside the path, and a rounded corner
+  // bends at most `roundness` further in; one more pixel for antialiasing.
+  const float inset = line + (roundness > 0 ? roundness : 0) + 1.0f;
+  const CLyFloatRectangle inside(rect.x1 + inset, rect.y1 + inset, rect.x2 - 2 * inset, rect.y2 - 2 * inset);
+  _pImpl->addPainted(region, &inside);
   _pImpl->boxRect.set((int)floor(rect.x1 + 0.01), (int)floor(rect.y1 + 0.01), (int)floor(rect.x2 + 0.01),
                       (int)floor(rect.y2 + 0.01));
   LYLOG_D("(%d %d %d %d)", _pImpl->boxRect.x, _pImpl->boxRect.y, _pImpl->boxRect.w, _pImpl->boxRect.h);
@@ -305,9 +327,28 @@ void CLyFocusBox::clearFrame() {
     if (_pImpl->icons[i]) evas_object_hide(_pImpl->icons[i]);
   }
   if (!_pImpl->canvas || !_pImpl->hasPainted) return;
-  _pImpl->canvas->clearRect(_pImpl->painted);
-  _pImpl->canvas->update(_pImpl->painted);
+  if (_pImpl->hasHole) {
+    // Four bands around the untouched hole, each cleared and updated alone.
+    const CLyFloatRectangle& p = _pImpl->painted;
+    const CLyFloatRectangle& h = _pImpl->hole;
+    const float px2 = p.x1 + p.x2, py2 = p.y1 + p.y2, hx2 = h.x1 + h.x2, hy2 = h.y1 + h.y2;
+    const CLyFloatRectangle bands[4] = {
+        CLyFloatRectangle(p.x1, p.y1, p.x2, h.y1 - p.y1),  // above
+        CLyFloatRectangle(p.x1, hy2, p.x2, py2 - hy2),     // below
+        CLyFloatRectangle(p.x1, h.y1, h.x1 - p.x1, h.y2),  // left
+        CLyFloatRectangle(hx2, h.y1, px2 - hx2, h.y2),     // right
+    };
+    for (const CLyFloatRectangle& b : bands) {
+      if (b.x2 <= 0 || b.y2 <= 0) continue;
+      _pImpl->canvas->clearRect(b);
+      _pImpl->canvas->update(b);
+    }
+  } else {
+    _pImpl->canvas->clearRect(_pImpl->painted);
+    _pImpl->canvas->update(_pImpl->painted);
+  }
   _pImpl->hasPainted = false;
+  _pImpl->hasHole = false;
 }
 
 void CLyFocusBox::showHandlers(const std::vector<CLyFloatPoint>& positions) {

@@ -13,6 +13,8 @@
 
 #include <functional>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "common/CLyFloatRectangle.h"
 #include "common/CLyPoint.h"
@@ -82,6 +84,9 @@ class CLyMultiGrid : public CLyControl {
   // The same rule for any list of photos and ratio, before a control exists.
   static bool computeSaveSize(CLyMultiGridSrcItemList* srcItemList, int ratio, int limit, int& width,
                               int& height);
+  // The same rule from the largest photo's longer side as it would be decoded
+  // for the screen (for bitmaps decoded smaller, for a save alone).
+  static bool computeSaveSize(int longestSide, int ratio, int limit, int& width, int& height);
   // A copy of a photo's bitmap (index -1 or -2: the current cell); null on failure.
   Bitmap* clone(int index) const;
 
@@ -139,7 +144,11 @@ class CLyMultiGrid : public CLyControl {
   void __draw();
   void __drawGridImages();
   void __updateGridImages();
-  bool __drawCells(bool clearFirst, bool newCrops, bool skipUnchanged);
+  bool __drawCells(bool clearFirst, bool newCrops, bool skipUnchanged,
+                   std::vector<CLyRectangle>* dirty = nullptr);
+  void __wipeChangedCells(const std::vector<std::pair<int, CLyFloatRectangle>>& cells,
+                          std::vector<CLyRectangle>* dirty);
+  bool __paintsWholeCell(int index) const;
   void __updateGridImage(int index);
   void __updateImage(int index, const CLyFloatRectangle& cell, bool recreate);
   void __createGridImage(int index, const CLyFloatRectangle& cell);

@@ -49,7 +49,11 @@ bool CLyMultiGridSaver::save(Evas_Object* win, Evas_Object* parent, const CLyMul
     return false;
   }
   int width = 0, height = 0;
-  if (!CLyMultiGrid::computeSaveSize(request.items, request.ratio, request.limit, width, height)) {
+  const bool sized =
+      request.longestSide > 0
+          ? CLyMultiGrid::computeSaveSize(request.longestSide, request.ratio, request.limit, width, height)
+          : CLyMultiGrid::computeSaveSize(request.items, request.ratio, request.limit, width, height);
+  if (!sized) {
     LYLOG_E("Failed to get save size");
     return false;
   }

@@ -23,6 +23,10 @@ struct CLyMultiGridSaveRequest {
   double roundness = 0.0;
   CLyRectangle background{255, 255, 255, 255};
   int limit = 2000;  // widest saved picture
+  // When > 0: the longer side of the largest photo as decoded for the screen.
+  // Photos decoded for this save alone, just large enough to cover their
+  // cells, are smaller than that and must not shrink the saved picture.
+  int longestSide = 0;
 };
 
 namespace CLyMultiGridSaver {

@@ -24,6 +24,28 @@ void CLyImageDecoderThread::setMaxDecodingSize(float width, float height) {
   mMaxDecodingHeight = height;
 }
 
+void CLyImageDecoderThread::setCoverSize(float width, float height) {
+  mCoverWidth = width > 0 ? width : 0.0f;
+  mCoverHeight = height > 0 ? height : 0.0f;
+}
+
+void CLyImageDecoderThread::computeCoverTarget(int w, int h, int orientation, float coverW, float coverH,
+                                               int* targetW, int* targetH) {
+  if (w < 1 || h < 1 || coverW <= 0 || coverH <= 0) return;
+  const bool turned = orientation == 6 || orientation == 8;
+  for (int m = 1; m < 8; m++) {
+    // libjpeg's scaled size: the image size times m / 8, rounded up.
+    const int sw = (int)(((long long)w * m + 7) / 8), sh = (int)(((long long)h * m + 7) / 8);
+    const int uw = turned ? sh : sw, uh = turned ? sw : sh;
+    if (uw < coverW || uh < coverH) continue;
+    if (sw < *targetW && sh < *targetH) {
+      *targetW = sw;
+      *targetH = sh;
+    }
+    return;
+  }
+}
+
 int CLyImageDecoderThread::rotationForOrientation(int orientation) {
   switch (orientation) {
     case 3:
@@ -85,6 +107,9 @@ void CLyImageDecoderThread::run() {
   int width = 0, height = 0;
   computeTarget(header.outWidth, header.outHeight, orientation, mMaxDecodingWidth, mMaxDecodingHeight, &width,
                 &height);
+  if (header.imageType == IMAGE_TYPE_JPEG)
+    computeCoverTarget(header.outWidth, header.outHeight, orientation, mCoverWidth, mCoverHeight, &width,
+                       &height);
 
   Bitmap* bitmap = nullptr;
   if (header.imageType == IMAGE_TYPE_PNG) {

@@ -18,6 +18,11 @@ class CLyImageDecoderThread : public CLyThread {
   bool set(int index, const std::string& path, ILyMultiGridListener* listener);
   // Upper bound of the decoded size of the upright image.
   void setMaxDecodingSize(float width, float height);
+  // The largest area (upright, in pixels) the photo will be drawn into. A
+  // JPEG is then decoded at the smallest DCT scale that still covers it when
+  // that is below the maximum decoding size: the bitmap is for this drawing
+  // alone (a save), not for the screen. 0 x 0 (the default) turns it off.
+  void setCoverSize(float width, float height);
 
   void run() override;
 
@@ -28,11 +33,19 @@ class CLyImageDecoderThread : public CLyThread {
   // EXIF orientation to a turn code of BitmapFactory::rotate (0 for none):
   // 3 -> 2, 6 -> 1, 8 -> 3; mirrored and unknown values are not turned.
   static int rotationForOrientation(int orientation);
+  // Shrinks the target *targetW x *targetH (stored orientation, from
+  // computeTarget) of a w x h JPEG to the smallest M/8 DCT scale whose upright
+  // image still covers coverW x coverH; the DCT size is decoded without any
+  // resampling. Leaves the target as it is when no such scale is smaller.
+  static void computeCoverTarget(int w, int h, int orientation, float coverW, float coverH, int* targetW,
+                                 int* targetH);
 
  private:
   int mIndex = 0;
   float mMaxDecodingWidth = 720.0f;
   float mMaxDecodingHeight = 1280.0f;
+  float mCoverWidth = 0.0f;
+  float mCoverHeight = 0.0f;
   ILyMultiGridListener* mListener = nullptr;
   std::string mPath;
 };

@@ -349,6 +349,59 @@ TEST_F(MultiGridTest, PartialRedrawRepaintsMovedCellsAndClearsWhereTheyWere) {
   g->destroy();
 }
 
+// A divider drag redraws with the canvas copying (SOURCE) and the cheap
+// filter, wiping only what no photo paints over: after every step the
+// canvas must hold exactly what a full redraw gives, with no trace of the
+// cells' old edges, rounded corners or gaps.
+TEST_F(MultiGridTest, CopyingPartialRedrawsEqualAFullRedraw) {
+  auto photo = [](int w, int h, uint32_t seed) {
+    Bitmap* b = BitmapFactory::createBitmap(w, h, BITMAP_FORMAT_BGRA);
+    auto* p = reinterpret_cast<uint32_t*>(b->getPixels());
+    for (int i = 0; i < w * h; i++) {
+      seed = seed * 1664525u + 1013904223u;
+      p[i] = 0xFF000000u | (seed >> 8);
+    }
+    return b;
+  };
+  addCell(mCells, 0, 0, 0.5f, 0.5f);
+  addCell(mCells, 0.5f, 0, 1, 0.5f);
+  addCell(mCells, 0, 0.5f, 1, 1);
+  mItems.add(itemOf(photo(400, 300, 1)));
+  mItems.add(itemOf(photo(300, 400, 2)));
+  mItems.add(itemOf(photo(500, 250, 3)));
+  auto* g = makeGrid(601, 601, true);  // odd size: cells get fractional edges
+  g->setBorderMarginValue(3);
+  g->setBorderRoundnessValue(11);
+  CLyCairoCanvas* canvas = Peer::impl(g)->canvas;
+  ASSERT_NE(nullptr, canvas);
+  canvas->setFilter(CAIRO_FILTER_FAST);
+  auto snapshot = [&]() {
+    cairo_surface_flush(canvas->getSurface());
+    const unsigned char* d = cairo_image_surface_get_data(canvas->getSurface());
+    const int stride = cairo_image_surface_get_stride(canvas->getSurface());
+    const int h = cairo_image_surface_get_height(canvas->getSurface());
+    return std::string(reinterpret_cast<const char*>(d), (size_t)stride * h);
+  };
+  Peer::draw(g);
+  const float steps[][2] = {{0.37f, 0.55f}, {0.61f, 0.43f}, {0.44f, 0.71f}, {0.52f, 0.29f}, {0.52f, 0.29f}};
+  for (const auto& s : steps) {
+    mCells.getItem(0)->x2 = s[0];
+    mCells.getItem(1)->x1 = s[0];
+    mCells.getItem(0)->y2 = s[1];
+    mCells.getItem(1)->y2 = s[1];
+    mCells.getItem(2)->y1 = s[1];
+    cairo_t* cr = canvas->getContext();
+    cairo_save(cr);
+    cairo_set_operator(cr, CAIRO_OPERATOR_SOURCE);
+    Peer::drawGridImages(g);
+    cairo_restore(cr);
+    const std::string partial = snapshot();
+    Peer::draw(g);
+    EXPECT_TRUE(partial == snapshot()) << "divider at " << s[0] << ", " << s[1];
+  }
+  g->destroy();
+}
+
 TEST_F(MultiGridTest, OneCellUpdateTouchesOnlyThatCell) {
   twoSideBySide();
   auto* g = makeGrid(800, 800, true);

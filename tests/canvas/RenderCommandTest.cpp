@@ -11,6 +11,7 @@
 
 #include "app-entry/CLyRenderCommand.h"
 #include "codec/BitmapFactory.h"
+#include "tests/codec/TestImages.h"
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::TempDir;
@@ -102,4 +103,37 @@ TEST_F(RenderCommandTest, WritesTheCollageAtTheSaveSize) {
 
 TEST_F(RenderCommandTest, UnwritableOutputFails) {
   EXPECT_EQ(LY_RENDER_FAILED, run({dir.file("no/such/folder/out.jpg"), a, b}));
+}
+
+// JPEGs are decoded only as large as their cells need, yet the saved picture
+// keeps the size the photos have on the screen, also when one photo fails
+// and the others are decoded again for a layout with fewer cells.
+TEST_F(RenderCommandTest, PhotosDecodedForTheirCellsKeepTheSaveSize) {
+  std::vector<std::string> photos;
+  for (int i = 0; i < 6; i++) {
+    photos.push_back(dir.file("p" + std::to_string(i) + ".jpg"));
+    ASSERT_TRUE(pictavo::test::writeJpeg(photos.back(), 1600, 1200, pictavo::test::quadrants(1600, 1200)));
+  }
+  const std::string out = dir.file("out.jpg");
+  std::vector<std::string> args = {out, "--screen", "1000x1000"};
+  args.insert(args.end(), photos.begin(), photos.end());
+  ASSERT_EQ(LY_RENDER_OK, run(args));
+  DecodeOptions o;
+  ASSERT_EQ(1, BitmapFactory::parseImage(out, o));
+  EXPECT_EQ(1000, o.outWidth);  // 1600 x 1200 bounded by 1000 x 1000: 1000 x 750
+  EXPECT_EQ(1000, o.outHeight);
+  DecodeOptions photo;
+  Bitmap* saved = BitmapFactory::decodeFile(out, photo, 1000, 1000, 0);
+  ASSERT_NE(nullptr, saved);
+  // Cell 0 (top left third) shows the photo's red top left quadrant.
+  const uint8_t* p = saved->getPixels() + (static_cast<size_t>(100) * 1000 + 100) * 4;
+  EXPECT_GT(p[2], 200);
+  EXPECT_LT(p[1], 60);
+  delete saved;
+
+  args[3] = dir.file("text.jpg");  // five usable photos
+  ASSERT_EQ(LY_RENDER_OK, run(args));
+  DecodeOptions o2;
+  ASSERT_EQ(1, BitmapFactory::parseImage(out, o2));
+  EXPECT_EQ(1000, o2.outWidth);
 }

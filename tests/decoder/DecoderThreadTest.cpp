@@ -307,3 +307,71 @@ TEST_F(DecoderThread, SixPhotosAtOnce) {
     EXPECT_EQ(c.result(i)->getHeight(), turned ? 960 : 540) << i;
   }
 }
+
+// A photo decoded for one save only: the smallest DCT scale whose upright
+// image still covers the cell, never above what the screen bound gives.
+TEST_F(DecoderThread, CoverTargetsTakeTheSmallestCoveringScale) {
+  int w = 2000, h = 1500;  // 4000 x 3000 within 2000 x 2000
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 667, 1000, &w, &h);
+  EXPECT_EQ(w, 1500);  // 3/8: 1125 rows cover 1000, 1/4 (750) would not
+  EXPECT_EQ(h, 1125);
+  w = 2000, h = 1500;
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 6, 667, 1000, &w, &h);
+  EXPECT_EQ(w, 1000);  // upright 750 x 1000 covers 667 x 1000
+  EXPECT_EQ(h, 750);
+  w = 2000, h = 1500;
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 0, 0, &w, &h);  // no cell: unchanged
+  EXPECT_EQ(w, 2000);
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 1900, 1900, &w, &h);  // only 1/2 covers: the bound
+  EXPECT_EQ(w, 2000);
+  EXPECT_EQ(h, 1500);
+  w = 720, h = 540;  // a bound below every covering scale is kept
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 1000, 1000, &w, &h);
+  EXPECT_EQ(w, 720);
+  EXPECT_EQ(h, 540);
+  w = 333, h = 250;  // odd sizes: libjpeg's rounding up
+  CLyImageDecoderThread::computeCoverTarget(1001, 751, 1, 100, 90, &w, &h);
+  EXPECT_EQ(w, 126);  // 1/8: ceil(1001 / 8) x ceil(751 / 8)
+  EXPECT_EQ(h, 94);
+  // Whatever the cell, the result covers it upright or is the bound itself.
+  for (int cw = 50; cw < 2100; cw += 173) {
+    for (int ch = 50; ch < 2100; ch += 191) {
+      for (int o : {1, 6}) {
+        int tw = 0, th = 0;
+        CLyImageDecoderThread::computeTarget(4000, 3000, o, 2000, 2000, &tw, &th);
+        const int bw = tw, bh = th;
+        CLyImageDecoderThread::computeCoverTarget(4000, 3000, o, (float)cw, (float)ch, &tw, &th);
+        const int uw = o == 6 ? th : tw, uh = o == 6 ? tw : th;
+        ASSERT_TRUE((tw == bw && th == bh) || (uw >= cw && uh >= ch)) << cw << "x" << ch << " o" << o;
+        ASSERT_LE(tw, bw);
+        ASSERT_LE(th, bh);
+      }
+    }
+  }
+}
+
+TEST_F(DecoderThread, ACoverSizeDecodesAtTheDctScaleUpright) {
+  TempDir dir;
+  JpegOptions turned;
+  turned.app1 = exifWithOrientation(6);
+  ASSERT_TRUE(writeJpeg(dir.file("plain.jpg"), 1600, 1200, quadrants(1600, 1200)));
+  ASSERT_TRUE(writeJpeg(dir.file("six.jpg"), 1600, 1200, quadrants(1600, 1200), turned));
+  Collector c;
+  for (int i = 0; i < 2; i++) {
+    CLyImageDecoderThread t;
+    t.setMaxDecodingSize(2000, 2000);
+    t.setCoverSize(300, 400);
+    t.set(i, dir.file(i == 0 ? "plain.jpg" : "six.jpg"), &c);
+    EXPECT_TRUE(t.start());
+  }
+  Bitmap* plain = c.result(0);
+  ASSERT_TRUE(plain);
+  EXPECT_EQ(plain->getWidth(), 600);  // 3/8: 450 rows cover 400
+  EXPECT_EQ(plain->getHeight(), 450);
+  EXPECT_EQ(corners(*plain), "rgbw");
+  Bitmap* six = c.result(1);
+  ASSERT_TRUE(six);
+  EXPECT_EQ(six->getWidth(), 300);  // 1/4, turned: 300 x 400
+  EXPECT_EQ(six->getHeight(), 400);
+  EXPECT_EQ(corners(*six), "brwg");
+}
