@@ -123,6 +123,7 @@ TEST_F(RenderCommandTest, PhotosDecodedForTheirCellsKeepTheSaveSize) {
   EXPECT_EQ(1000, o.outWidth);  // 1600 x 1200 bounded by 1000 x 1000: 1000 x 750
   EXPECT_EQ(1000, o.outHeight);
   DecodeOptions photo;
+  photo.colorFormat = BITMAP_FORMAT_BGRA;
   Bitmap* saved = BitmapFactory::decodeFile(out, photo, 1000, 1000, 0);
   ASSERT_NE(nullptr, saved);
   // Cell 0 (top left third) shows the photo's red top left quadrant.
