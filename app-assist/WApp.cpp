@@ -2,6 +2,7 @@
 
 #include <cstdio>
 
+#include "app-assist/WDeletionHook.h"
 #include "app-assist/WMenuPopupController.h"
 #include "app-assist/WViewController.h"
 #include "app-assist/WWindowController.h"
@@ -28,7 +29,7 @@ WApp::~WApp() {
   // The window may outlive the application object (it goes with elm
   // shutdown); stop listening for its deletion.
   if (_pv->_window && _pv->_window->getEvasObj())
-    evas_object_event_callback_del_full(_pv->_window->getEvasObj(), EVAS_CALLBACK_DEL, __onWindowDel, this);
+    wevasobject_remove_deletion_hook(_pv->_window->getEvasObj(), __onWindowDel, this);
   delete _pv;
 }
 
@@ -53,7 +54,7 @@ bool WApp::attachWindowController(WWindowController* window) {
   // The window controller deletes itself with its window; forget it then so
   // terminate does not reach a deleted controller.
   if (Evas_Object* win = window->getEvasObj())
-    evas_object_event_callback_add(win, EVAS_CALLBACK_DEL, __onWindowDel, this);
+    wevasobject_add_deletion_hook(win, __onWindowDel, this);
   else
     LYLOG_E("Window is not created");
   return created;
@@ -63,7 +64,7 @@ WWindowController* WApp::getWindowController() const {
   return _pv->_window;
 }
 
-void WApp::__onWindowDel(void* data, Evas*, Evas_Object*, void*) {
+void WApp::__onWindowDel(void* data, Evas_Object*) {
   static_cast<WApp*>(data)->_pv->_window = nullptr;
 }
 

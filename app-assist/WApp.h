@@ -43,7 +43,7 @@ class WApp {
   static void __onPause(void* data);
   static void __onResume(void* data);
   static void __onAppControl(app_control_h request, void* data);
-  static void __onWindowDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onWindowDel(void* data, Evas_Object* obj);
 
   _WAppImpl* _pv;
 };

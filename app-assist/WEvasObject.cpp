@@ -1,6 +1,7 @@
 #include <new>
 
 #include "app-assist/IWEvasObject.h"
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyLog.h"
 
 namespace app_assist {
@@ -11,7 +12,7 @@ class _WEvasObjectImpl : public IWEvasObject {
   explicit _WEvasObjectImpl(Evas_Object* obj) : _obj(obj) {}
   Evas_Object* getEvasObj() const override { return _obj; }
 
-  static void onDel(void* data, Evas*, Evas_Object*, void*) {
+  static void onDel(void* data, Evas_Object*) {
     auto* self = static_cast<_WEvasObjectImpl*>(data);
     std::shared_ptr<IWEvasObject> last = std::move(self->_self);
   }
@@ -31,7 +32,7 @@ std::weak_ptr<IWEvasObject> wevasobject_get_weak_ptr(Evas_Object* obj) {
     return {};
   }
   impl->_self = std::shared_ptr<IWEvasObject>(impl);
-  evas_object_event_callback_add(obj, EVAS_CALLBACK_DEL, _WEvasObjectImpl::onDel, impl);
+  wevasobject_add_deletion_hook(obj, _WEvasObjectImpl::onDel, impl);
   return impl->_self;
 }
 

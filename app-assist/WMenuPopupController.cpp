@@ -3,6 +3,7 @@
 #include <vector>
 
 #include "app-assist/IWEvasObject.h"
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyLog.h"
 #include "platform/efl_extension.h"
 
@@ -66,14 +67,13 @@ Evas_Object* WMenuPopupController::onCreateView(Evas_Object*, void*) {
   evas_object_smart_callback_add(ctx, "dismissed", __onDismissed, this);
   evas_object_smart_callback_add(ctx, "language,changed", __onDismissed, this);
   // Must run before the view controller's own deletion handling deletes this.
-  evas_object_event_callback_priority_add(ctx, EVAS_CALLBACK_DEL, EVAS_CALLBACK_PRIORITY_BEFORE, __onMenuDel,
-                                          this);
+  wevasobject_add_deletion_hook(ctx, __onMenuDel, this, true);
   _mp->_ctxpopup = ctx;
   gCurrentMenu = ctx;
   return ctx;
 }
 
-void WMenuPopupController::__onMenuDel(void* data, Evas*, Evas_Object* obj, void*) {
+void WMenuPopupController::__onMenuDel(void* data, Evas_Object* obj) {
   auto* self = static_cast<WMenuPopupController*>(data);
   if (gCurrentMenu == obj) gCurrentMenu = nullptr;
   if (auto layout = self->_mp->_layoutRef.lock())

@@ -38,7 +38,7 @@ class WMenuPopupController : public WViewController {
   static void __onBackKey(void* data, Evas_Object* obj, void* event);
   static void __onLayoutResize(void* data, Evas* evas, Evas_Object* obj, void* event);
   static void __onRotationChanged(void* data, Evas_Object* obj, void* event);
-  static void __onMenuDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onMenuDel(void* data, Evas_Object* obj);
 
   _WMenuPopupControllerImpl* _mp;
 };

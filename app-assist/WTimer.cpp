@@ -2,6 +2,7 @@
 
 #include <new>
 
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyLog.h"
 
 namespace app_assist {
@@ -61,7 +62,7 @@ WTimerWeakPtr WTimer::__add(Type type, double seconds, RepeatFunc repeat, JobFun
   }
   if (ownerObj) {
     timer->_pv->_owner = ownerObj;
-    evas_object_event_callback_add(ownerObj, EVAS_CALLBACK_DEL, __onOwnerDel, timer);
+    wevasobject_add_deletion_hook(ownerObj, __onOwnerDel, timer);
   }
   return weak;
 }
@@ -125,7 +126,7 @@ void WTimer::__onJob(void* data) {
   if (timer->_pv->_self) timer->_destroy();
 }
 
-void WTimer::__onOwnerDel(void* data, Evas*, Evas_Object*, void*) {
+void WTimer::__onOwnerDel(void* data, Evas_Object*) {
   auto* timer = static_cast<WTimer*>(data);
   // The owner is going: nothing to unregister from it.
   timer->_pv->_owner = nullptr;
@@ -134,7 +135,7 @@ void WTimer::__onOwnerDel(void* data, Evas*, Evas_Object*, void*) {
 
 void WTimer::_destroy() {
   if (_pv->_owner) {
-    evas_object_event_callback_del_full(_pv->_owner, EVAS_CALLBACK_DEL, __onOwnerDel, this);
+    wevasobject_remove_deletion_hook(_pv->_owner, __onOwnerDel, this);
     _pv->_owner = nullptr;
   }
   if (void* handle = _pv->_handle) {

@@ -50,7 +50,7 @@ class WTimer {
                              Evas_Object* ownerObj);
   static Eina_Bool __onRepeat(void* data);
   static void __onJob(void* data);
-  static void __onOwnerDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onOwnerDel(void* data, Evas_Object* obj);
   void _destroy();
   void* _handleOf(Type type, const char* name) const;
 

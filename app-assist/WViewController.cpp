@@ -5,6 +5,7 @@
 
 #include "app-assist/IWWindowController.h"
 #include "app-assist/WDefine.h"
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyLog.h"
 
 namespace app_assist {
@@ -65,13 +66,13 @@ bool WViewController::create(Evas_Object* parent, void* param) {
 
   if (_pv->_name) evas_object_name_set(view, _pv->_name);
   evas_object_data_set(view, kViewInstanceKey, this);
-  evas_object_event_callback_add(view, EVAS_CALLBACK_DEL, __onViewDel, this);
+  wevasobject_add_deletion_hook(view, __onViewDel, this);
   _pv->_obj = view;
   onCreated();
   return true;
 }
 
-void WViewController::__onViewDel(void* data, Evas*, Evas_Object* obj, void*) {
+void WViewController::__onViewDel(void* data, Evas_Object* obj) {
   auto* self = static_cast<WViewController*>(data);
   evas_object_data_del(obj, kViewInstanceKey);
   // A popup shown for this view must not outlive it: its handlers refer to

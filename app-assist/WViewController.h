@@ -63,7 +63,7 @@ class WViewController {
   virtual void onDestroy();
 
  private:
-  static void __onViewDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onViewDel(void* data, Evas_Object* obj);
 
   WViewControllerImpl* _pv;
 };

@@ -5,6 +5,7 @@
 #include <string>
 
 #include "app-assist/WDefine.h"
+#include "app-assist/WDeletionHook.h"
 #include "app-assist/WViewController.h"
 #include "common/CLyLog.h"
 #include "platform/app.h"
@@ -103,12 +104,12 @@ bool WWindowController::precreate() {
 
   evas_object_smart_callback_add(
       win, "delete,request", [](void*, Evas_Object*, void*) { elm_exit(); }, nullptr);
-  evas_object_event_callback_add(win, EVAS_CALLBACK_DEL, __onWindowDel, this);
+  wevasobject_add_deletion_hook(win, __onWindowDel, this);
   if (_pv->_backKeyHandler) eext_object_event_callback_add(win, EEXT_CALLBACK_BACK, __onBackKey, this);
   return true;
 }
 
-void WWindowController::__onWindowDel(void* data, Evas*, Evas_Object*, void*) {
+void WWindowController::__onWindowDel(void* data, Evas_Object*) {
   auto* self = static_cast<WWindowController*>(data);
   self->_pv->_win = nullptr;
   self->_pv->_baseLayout = nullptr;

@@ -53,7 +53,7 @@ class WWindowController : public IWWindowController {
   virtual void onDestroy();
 
  private:
-  static void __onWindowDel(void* data, Evas* evas, Evas_Object* obj, void* event);
+  static void __onWindowDel(void* data, Evas_Object* obj);
   static void __onBackKey(void* data, Evas_Object* obj, void* event);
 
   _WWindowControllerImpl* _pv;

@@ -214,7 +214,7 @@ class DecodeResults : public ILyMultiGridListener {
 // follows the largest photo as the screen would show it (the screen size
 // ordered so that width <= height, like the main view), but each photo is
 // decoded only as large as its cell in the saved picture needs: a 12 MP
-// photo in a sixth of a 2000 x 2000 collage is decoded at 3/8, not at 1/2.
+// photo turned upright in a sixth of a 2000 x 2000 collage is decoded at 1/4, not at 1/2.
 struct DecodePlan {
   float maxW = 0, maxH = 0;
   int longestSide = 0;                // 0 when no photo could be read

@@ -38,14 +38,16 @@ FILE* openRegular(const std::string& path) {
 // Pixel buffers of a few MiB and more ask for transparent huge pages: the
 // first write of a decoded photo then takes one page fault per 2 MiB instead
 // of 512, and on a virtual machine those faults cost more than decoding the
-// pixels' last step. Freed with free() like any other buffer. `zero`: the
-// caller relies on a cleared buffer.
+// pixels' last step.
 unsigned char* allocPixels(size_t size, bool zero) {
   constexpr size_t kHuge = 2u << 20;
-  if (size < 2 * kHuge) return static_cast<unsigned char*>(zero ? calloc(1, size) : malloc(size));
+  if (size < kHuge) return static_cast<unsigned char*>(zero ? calloc(1, size) : malloc(size));
+  // Whole huge pages: the tail of the last one would otherwise fall back to
+  // small pages.
+  const size_t rounded = (size + kHuge - 1) & ~(kHuge - 1);
   void* p = nullptr;
-  if (posix_memalign(&p, kHuge, size) != 0) return nullptr;
-  madvise(p, size & ~(kHuge - 1), MADV_HUGEPAGE);  // only a hint: no huge pages, no harm
+  if (rounded < size || posix_memalign(&p, kHuge, rounded) != 0) return nullptr;
+  madvise(p, rounded, MADV_HUGEPAGE);  // only a hint: no huge pages, no harm
   if (zero) memset(p, 0, size);
   return static_cast<unsigned char*>(p);
 }
@@ -68,6 +70,10 @@ Bitmap* createUnclearedBitmap(int width, int height, int format) {
   return bitmap;
 }
 }  // namespace
+
+unsigned char* allocLarge(size_t size, bool zero) {
+  return allocPixels(size, zero);
+}
 
 bool imageSizeAcceptable(long long width, long long height) {
   return width > 0 && height > 0 && width <= kMaxImageSide && height <= kMaxImageSide &&

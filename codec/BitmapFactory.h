@@ -42,5 +42,11 @@ int decodePNG(DecodeOptions& options, Bitmap& bitmap, int width, int height);
 void rotate(Bitmap& bitmap, int rotation);
 // A new bitmap with a copy of the pixels; null when there is nothing to copy.
 Bitmap* clone(Bitmap& bitmap);
+// Writes width x height pixels of 4 bytes (B, G, R, unused), rows `stride`
+// bytes apart, to `path` as a baseline 4:2:0 JPEG of the quality (1-100).
+// False (logged) on bad arguments or any write error; the file may then be
+// incomplete, and the caller removes it.
+bool writeJpegBgrx(const unsigned char* pixels, int width, int height, int stride, int quality,
+                   const std::string& path);
 
 }  // namespace BitmapFactory

@@ -576,7 +576,7 @@ void CLyCairoCanvas::drawBitmap(Bitmap* bitmap, const CLyFloatRectangle& dst) {
 
 // ---------------------------------------------------------------- nearest copy
 
-bool CLyCairoCanvas::_canCopyNearest(cairo_surface_t* surface) const {
+bool CLyCairoCanvas::canCopyNearest(cairo_surface_t* surface) const {
   if (mUseGl || !mContext || !mSurface || !surface) return false;
   if (mFilter != CAIRO_FILTER_FAST && mFilter != CAIRO_FILTER_NEAREST) return false;
   if (cairo_get_operator(mContext) != CAIRO_OPERATOR_SOURCE) return false;
@@ -648,9 +648,10 @@ void CLyCairoCanvas::_copyNearest(cairo_surface_t* surface, const CLyFloatRectan
 }
 
 void CLyCairoCanvas::drawBitmapInRoundRect(cairo_surface_t* surface, const CLyFloatRectangle& dst,
-                                           const CLyRectangle& src, double radius) {
+                                           const CLyRectangle& src, double radius,
+                                           const cairo_region_t* keep) {
   if (!mContext) return;
-  if (!_canCopyNearest(surface) || dst.x2 <= 0 || dst.y2 <= 0 || src.w <= 0 || src.h <= 0) {
+  if (!canCopyNearest(surface) || dst.x2 <= 0 || dst.y2 <= 0 || src.w <= 0 || src.h <= 0) {
     beginPath();
     setRoundRectPath(dst, radius, radius);
     drawBitmap(surface, dst, src);
@@ -684,6 +685,13 @@ void CLyCairoCanvas::drawBitmapInRoundRect(cairo_surface_t* surface, const CLyFl
   cairo_region_t* edge = cairo_region_create_rectangle(&outer);
   cairo_region_intersect_rectangle(edge, &canvas);
   cairo_region_subtract(edge, inside);
+  if (keep) {
+    cairo_region_t* k = cairo_region_copy(keep);
+    cairo_region_translate(k, -mGeometry.x, -mGeometry.y);
+    cairo_region_subtract(inside, k);
+    cairo_region_subtract(edge, k);
+    cairo_region_destroy(k);
+  }
 
   if (!cairo_region_is_empty(inside)) _copyNearest(surface, dst, src, inside);
   if (!cairo_region_is_empty(edge)) {

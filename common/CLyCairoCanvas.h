@@ -87,8 +87,13 @@ class CLyCairoCanvas {
   // pixels inside the path are copied by a plain nearest-neighbour loop and
   // cairo only fills the partly covered edge: the same picture, at a
   // fraction of the cost, for redraws while a finger moves.
+  // `keep` (evas coordinates, optional): whole pixels inside the path left
+  // as they are, for a caller that put valid pixels there itself; honoured
+  // only when the canvas copies.
   void drawBitmapInRoundRect(cairo_surface_t* surface, const CLyFloatRectangle& dst, const CLyRectangle& src,
-                             double radius);
+                             double radius, const cairo_region_t* keep = nullptr);
+  // Whether drawBitmapInRoundRect copies `surface` itself (see above).
+  bool canCopyNearest(cairo_surface_t* surface) const;
 
  private:
   void _init(Evas_Object* image, const CLyRectangle& geometry, bool useGl);
@@ -98,7 +103,6 @@ class CLyCairoCanvas {
   void _releaseGl();
   void _flushGl();
   void _setSourcePattern(cairo_surface_t* surface, const cairo_matrix_t& matrix);
-  bool _canCopyNearest(cairo_surface_t* surface) const;
   void _copyNearest(cairo_surface_t* surface, const CLyFloatRectangle& dst, const CLyRectangle& src,
                     const cairo_region_t* area);
 

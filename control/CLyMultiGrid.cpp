@@ -51,6 +51,10 @@ bool sameRect(const CLyFloatRectangle& a, const CLyFloatRectangle& b) {
   return a.x1 == b.x1 && a.y1 == b.y1 && a.x2 == b.x2 && a.y2 == b.y2;
 }
 
+// How far (screen pixels, across a cell) the content of a cell's kept
+// pixels may drift from where a fresh drawing puts it during a handler drag.
+const double kMaxDriftPixels = 1.0;
+
 // The whole pixels r (x, y, w, h) touches at all. Empty for an empty r.
 cairo_rectangle_int_t outerPixels(const CLyFloatRectangle& r) {
   if (!(r.x2 > 0) || !(r.y2 > 0)) return {0, 0, 0, 0};
@@ -94,6 +98,23 @@ bool isCompleteJpeg(const char* path) {
   // The data must be on the disk before the file takes its final name.
   ok = ok && fsync(fd) == 0;
   close(fd);
+  return ok;
+}
+
+// The picture's pixels go to libjpeg-turbo as they are (B, G, R, X rows),
+// at the quality and 4:2:0 sampling evas_object_image_save uses without
+// flags, but without its copy of every row into RGB on the way.
+constexpr int kSaveQuality = 80;
+
+bool writeObjectJpeg(Evas_Object* object, const std::string& path) {
+  int w = 0, h = 0;
+  evas_object_image_size_get(object, &w, &h);
+  const int stride = evas_object_image_stride_get(object);
+  void* data = evas_object_image_data_get(object, EINA_FALSE);
+  if (!data) return false;
+  const bool ok =
+      BitmapFactory::writeJpegBgrx(static_cast<const unsigned char*>(data), w, h, stride, kSaveQuality, path);
+  evas_object_image_data_set(object, data);
   return ok;
 }
 
@@ -598,7 +619,7 @@ bool CLyMultiGrid::__calculateRectSize(const CLyRectangle& crop, const CLyFloatR
   return true;
 }
 
-void CLyMultiGrid::__createGridImage(int index, const CLyFloatRectangle& cell) {
+void CLyMultiGrid::__createGridImage(int index, const CLyFloatRectangle& cell, const cairo_region_t* keep) {
   CLyMultiGridSrcItem* item = _pImpl->srcItemList ? _pImpl->srcItemList->get(index) : nullptr;
   if (!item) {
     LYLOG_E("Invalid src item");
@@ -625,8 +646,8 @@ void CLyMultiGrid::__createGridImage(int index, const CLyFloatRectangle& cell) {
     LYLOG_E("Invalid src rect");
     return;
   }
-  canvas->drawBitmapInRoundRect(surface, cell,
-                                CLyRectangle(crop->x, crop->y, crop->w - crop->x, crop->h - crop->y), r);
+  canvas->drawBitmapInRoundRect(
+      surface, cell, CLyRectangle(crop->x, crop->y, crop->w - crop->x, crop->h - crop->y), r, keep);
 }
 
 // Wipes the old and the new place of every changed cell before any of them is
@@ -732,12 +753,136 @@ bool CLyMultiGrid::__drawCells(bool clearFirst, bool newCrops, bool skipUnchange
     }
     toDraw.emplace_back(i, d);
   }
+  // Pixels to reuse: planned and saved before anything is wiped or drawn (a
+  // cell's old pixels may lie where another cell is drawn now).
+  struct Moved {
+    cairo_region_t* keep;  // destination, evas coordinates
+    int dx, dy;
+    std::vector<uint32_t> pixels;
+  };
+  std::vector<Moved> moved(toDraw.size(), Moved{nullptr, 0, 0, {}});
+  const bool reuse = skipUnchanged && _pImpl->reusePixels;
+  if (!reuse) __forgetDrawnPixels();
+  if (reuse) {
+    if ((int)_pImpl->drawnCrops.size() < count) _pImpl->drawnCrops.resize(count, CLyRectangle(0, 0, 0, 0));
+    if ((int)_pImpl->sampledScales.size() < count) _pImpl->sampledScales.resize(count, {0.0, 0.0});
+    for (size_t k = 0; k < toDraw.size(); k++) {
+      Moved& m = moved[k];
+      m.keep = __planReuse(toDraw[k].first, toDraw[k].second, m.dx, m.dy);
+      if (m.keep && (m.dx || m.dy)) __copyCanvasPixels(m.keep, m.dx, m.dy, &m.pixels, true);
+    }
+  }
   if (skipUnchanged) __wipeChangedCells(toDraw, dirty);
-  for (const auto& cell : toDraw) {
-    __createGridImage(cell.first, cell.second);
-    _pImpl->drawnRects[cell.first] = cell.second;
+  for (size_t k = 0; k < toDraw.size(); k++) {
+    const int i = toDraw[k].first;
+    Moved& m = moved[k];
+    if (m.keep && (m.dx || m.dy)) __copyCanvasPixels(m.keep, m.dx, m.dy, &m.pixels, false);
+    __createGridImage(i, toDraw[k].second, m.keep);
+    if (m.keep) cairo_region_destroy(m.keep);
+    _pImpl->drawnRects[i] = toDraw[k].second;
+    if ((size_t)i < _pImpl->drawnCrops.size()) {
+      CLyMultiGridSrcItem* item = items->get(i);
+      const CLyRectangle* crop = item ? item->getSrcRect() : nullptr;
+      const bool photo = reuse && crop && __paintsWholeCell(i);
+      _pImpl->drawnCrops[i] = photo ? *crop : CLyRectangle(0, 0, 0, 0);
+      if (photo && !m.keep)
+        _pImpl->sampledScales[i] = {(crop->w - crop->x) / (double)toDraw[k].second.x2,
+                                    (crop->h - crop->y) / (double)toDraw[k].second.y2};
+    }
   }
   return complete;
+}
+
+// The pixels of cell i that a step can keep instead of drawing them again
+// (evas coordinates; null: draw the whole cell). They are the pixels the
+// cell's last drawing covered completely, moved by the whole-pixel shift
+// (dx, dy) of its corner, and covered completely now. Only when the canvas
+// copies with the cheap filter, the crop's corner stayed, and the scale
+// drifted by at most one screen pixel across the cell since those pixels
+// were sampled (crops are whole texels, so a crop fitted to a changing cell
+// wobbles by a texel anyway): a kept pixel then shows what a new drawing
+// shows at most one pixel away, and the full redraw on release puts every
+// texel back.
+cairo_region_t* CLyMultiGrid::__planReuse(int index, const CLyFloatRectangle& cell, int& dx, int& dy) {
+  dx = dy = 0;
+  if (index < 0 || (size_t)index >= _pImpl->drawnCrops.size() || (size_t)index >= _pImpl->drawnRects.size())
+    return nullptr;
+  if (!__paintsWholeCell(index) || !_pImpl->canvas->canCopyNearest(_pImpl->surfaces[index])) return nullptr;
+  const CLyRectangle& before = _pImpl->drawnCrops[index];
+  const CLyRectangle* now = _pImpl->srcItemList->get(index)->getSrcRect();
+  const CLyFloatRectangle& was = _pImpl->drawnRects[index];
+  if (before.w <= before.x || before.h <= before.y || !(was.x2 > 0) || !(was.y2 > 0)) return nullptr;
+  if (before.x != now->x || before.y != now->y) return nullptr;
+  const double sx = _pImpl->sampledScales[index].first, sy = _pImpl->sampledScales[index].second;
+  const double nx = (now->w - now->x) / (double)cell.x2, ny = (now->h - now->y) / (double)cell.y2;
+  // The drift across the cell, in texels, over the texels per screen pixel.
+  if (std::fabs(nx - sx) * std::max(was.x2, cell.x2) / nx > kMaxDriftPixels ||
+      std::fabs(ny - sy) * std::max(was.y2, cell.y2) / ny > kMaxDriftPixels)
+    return nullptr;
+  const double fx = (double)cell.x1 - was.x1, fy = (double)cell.y1 - was.y1;
+  if (fx != std::floor(fx) || fy != std::floor(fy)) return nullptr;
+  dx = (int)fx;
+  dy = (int)fy;
+  const double radius = _pImpl->drawRectList ? _pImpl->drawRectList->getRoundness() : 0;
+  cairo_region_t* keep = cairo_region_create();
+  addCoveredPixels(keep, was, radius);
+  cairo_region_translate(keep, dx, dy);
+  cairo_region_t* covered = cairo_region_create();
+  addCoveredPixels(covered, cell, radius);
+  cairo_region_intersect(keep, covered);
+  cairo_region_destroy(covered);
+  const CLyRectangle& g = _pImpl->canvas->getGeometry();
+  const cairo_rectangle_int_t area = {g.x, g.y, g.w, g.h};
+  cairo_region_intersect_rectangle(keep, &area);
+  cairo_region_t* source = cairo_region_copy(keep);  // the old pixels must lie on the canvas too
+  cairo_region_translate(source, -dx, -dy);
+  cairo_region_intersect_rectangle(source, &area);
+  cairo_region_translate(source, dx, dy);
+  cairo_region_intersect(keep, source);
+  cairo_region_destroy(source);
+  if (cairo_region_is_empty(keep)) {
+    cairo_region_destroy(keep);
+    return nullptr;
+  }
+  LYLOG_D("Reuse pixels of cell %d, moved %d %d", index, dx, dy);
+  return keep;
+}
+
+// save: copies the canvas pixels that will land on `keep` (they lie at
+// keep − (dx, dy)) into `pixels`; otherwise writes them back onto `keep`.
+void CLyMultiGrid::__copyCanvasPixels(const cairo_region_t* keep, int dx, int dy,
+                                      std::vector<uint32_t>* pixels, bool save) {
+  cairo_surface_t* surface = _pImpl->canvas->getSurface();
+  cairo_surface_flush(surface);
+  unsigned char* data = cairo_image_surface_get_data(surface);
+  if (!data) return;
+  const int stride = cairo_image_surface_get_stride(surface);
+  const CLyRectangle& g = _pImpl->canvas->getGeometry();
+  if (save) pixels->clear();
+  size_t at = 0;
+  const int n = cairo_region_num_rectangles(keep);
+  for (int i = 0; i < n; i++) {
+    cairo_rectangle_int_t r;
+    cairo_region_get_rectangle(keep, i, &r);
+    for (int y = r.y; y < r.y + r.height; y++) {
+      if (save) {
+        const auto* row =
+            reinterpret_cast<const uint32_t*>(data + (size_t)(y - dy - g.y) * stride) + (r.x - dx - g.x);
+        pixels->insert(pixels->end(), row, row + r.width);
+      } else {
+        auto* row = reinterpret_cast<uint32_t*>(data + (size_t)(y - g.y) * stride) + (r.x - g.x);
+        std::copy(pixels->begin() + at, pixels->begin() + at + r.width, row);
+        at += r.width;
+      }
+    }
+  }
+  if (!save) cairo_surface_mark_dirty(surface);
+}
+
+// Nothing drawn so far may be reused (the canvas was drawn on by others).
+void CLyMultiGrid::__forgetDrawnPixels() {
+  _pImpl->drawnCrops.clear();
+  _pImpl->sampledScales.clear();
 }
 
 void CLyMultiGrid::__draw() {
@@ -790,6 +935,7 @@ void CLyMultiGrid::__updateImage(int index, const CLyFloatRectangle& cell, bool 
   }
   __createGridImage(index, cell);
   if ((size_t)index < _pImpl->drawnRects.size()) _pImpl->drawnRects[index] = cell;
+  if ((size_t)index < _pImpl->drawnCrops.size()) _pImpl->drawnCrops[index] = CLyRectangle(0, 0, 0, 0);
   _pImpl->canvas->update(cell);
 }
 
@@ -926,8 +1072,7 @@ bool CLyMultiGrid::save(const std::string& path) {
   // Written under a temporary name next to the target and renamed only when
   // complete, so a failure never leaves a partial file under the real name.
   const std::string temporary = temporaryPathFor(path);
-  Eina_Bool written =
-      evas_object_image_save(image ? image : _pImpl->canvasImage, temporary.c_str(), nullptr, nullptr);
+  const bool written = writeObjectJpeg(image ? image : _pImpl->canvasImage, temporary);
   if (image) evas_object_del(image);
   if (!written || !isCompleteJpeg(temporary.c_str())) {
     LYLOG_E("evas_object_image_save failed");

@@ -11,6 +11,7 @@
 #include <Evas.h>
 #include <cairo.h>
 
+#include <cstdint>
 #include <functional>
 #include <string>
 #include <utility>
@@ -151,7 +152,11 @@ class CLyMultiGrid : public CLyControl {
   bool __paintsWholeCell(int index) const;
   void __updateGridImage(int index);
   void __updateImage(int index, const CLyFloatRectangle& cell, bool recreate);
-  void __createGridImage(int index, const CLyFloatRectangle& cell);
+  void __createGridImage(int index, const CLyFloatRectangle& cell, const cairo_region_t* keep = nullptr);
+  cairo_region_t* __planReuse(int index, const CLyFloatRectangle& cell, int& dx, int& dy);
+  void __forgetDrawnPixels();
+  void __copyCanvasPixels(const cairo_region_t* keep, int dx, int dy, std::vector<uint32_t>* pixels,
+                          bool save);
   bool __calculateRectSize(const CLyRectangle& crop, const CLyFloatRectangle& cell,
                            CLyRectangle& result) const;
   void __rotateGridImage(int index, double angle);

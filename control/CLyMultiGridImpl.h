@@ -7,6 +7,7 @@
 #include <cairo.h>
 
 #include <functional>
+#include <utility>
 #include <vector>
 
 #include "common/CLyFloatRectangle.h"
@@ -74,6 +75,14 @@ struct _CLyMultiGridImpl {
   // Cell rectangle each cell was last drawn at, so a partial redraw also
   // repaints cells that moved without changing their crop.
   std::vector<CLyFloatRectangle> drawnRects;
+  // Pixel reuse while a handler drag redraws (reusePixels, set by the touch
+  // code): the crop each cell was last drawn with and the scale (texels per
+  // pixel, x and y) its kept pixels were sampled at. A step then moves a
+  // cell's still valid pixels instead of resampling them. Empty or invalid
+  // entries mean: redraw the whole cell.
+  bool reusePixels = false;
+  std::vector<CLyRectangle> drawnCrops;
+  std::vector<std::pair<double, double>> sampledScales;
 
   // --- touch interaction (CLyMultiGridTouch.cpp) ---
   int touchedIndex = -1;

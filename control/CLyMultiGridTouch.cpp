@@ -149,6 +149,7 @@ void CLyMultiGrid::__endHandlerDrag() {
   _CLyMultiGridTouchState* ts = touchState(_pImpl);
   if (!ts || !ts->drafting) return;
   ts->drafting = false;
+  __forgetDrawnPixels();
   if (!_pImpl->canvas) return;
   _pImpl->canvas->setFilter(ts->savedFilter);
   __updateGridImages();
@@ -563,7 +564,12 @@ void CLyMultiGrid::__resizeFocusRect(const CLyPoint& delta, int dotIndex) {
     ts->drafting = true;
     ts->savedFilter = _pImpl->canvas->getFilter();
     _pImpl->canvas->setFilter(CAIRO_FILTER_FAST);
+    __forgetDrawnPixels();
   }
+  // Between steps a cell mostly keeps its scale: its pixels move (or stay)
+  // rather than being drawn again. Not while a press effect paints a cell.
+  _pImpl->reusePixels = ts && ts->drafting;
+  if (_pImpl->pressEffect) __forgetDrawnPixels();
   // Photos are opaque: copying them (SOURCE) skips reading the canvas back.
   // Placeholder icons need blending, so single-image mode keeps OVER.
   cairo_t* cr = _pImpl->canvas ? _pImpl->canvas->getContext() : nullptr;
@@ -574,6 +580,7 @@ void CLyMultiGrid::__resizeFocusRect(const CLyPoint& delta, int dotIndex) {
   }
   __drawGridImages();
   if (copy) cairo_restore(cr);
+  _pImpl->reusePixels = false;
   if (_pImpl->focusBox) {
     _pImpl->previousIndex = current;
     __destroyFocusRect();
@@ -753,6 +760,7 @@ void CLyMultiGrid::__cleanGridImage(int index) {
   }
   const CLyFloatRectangle cell = __cellRect(index);
   const double r = _pImpl->drawRectList->getRoundness();
+  __forgetDrawnPixels();
   _pImpl->canvas->fillRoundRect(CLyFloatRectangle(0, 0, 0, 1.0f), cell, r, r);
   _pImpl->canvas->update(cell);
 }

@@ -33,7 +33,11 @@ void CLyImageDecoderThread::computeCoverTarget(int w, int h, int orientation, fl
                                                int* targetW, int* targetH) {
   if (w < 1 || h < 1 || coverW <= 0 || coverH <= 0) return;
   const bool turned = orientation == 6 || orientation == 8;
-  for (int m = 1; m < 8; m++) {
+  // Only the 1/8, 1/4 and 1/2 scales: libjpeg-turbo has vector code for
+  // their inverse DCTs, while 3/8, 5/8... run in plain C and cost more than
+  // their fewer pixels save (9% more instructions for six 12 MP photos at
+  // 3/8 than at 1/2).
+  for (int m = 1; m < 8; m *= 2) {
     // libjpeg's scaled size: the image size times m / 8, rounded up.
     const int sw = (int)(((long long)w * m + 7) / 8), sh = (int)(((long long)h * m + 7) / 8);
     const int uw = turned ? sh : sw, uh = turned ? sw : sh;

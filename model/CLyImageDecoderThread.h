@@ -34,9 +34,10 @@ class CLyImageDecoderThread : public CLyThread {
   // 3 -> 2, 6 -> 1, 8 -> 3; mirrored and unknown values are not turned.
   static int rotationForOrientation(int orientation);
   // Shrinks the target *targetW x *targetH (stored orientation, from
-  // computeTarget) of a w x h JPEG to the smallest M/8 DCT scale whose upright
-  // image still covers coverW x coverH; the DCT size is decoded without any
-  // resampling. Leaves the target as it is when no such scale is smaller.
+  // computeTarget) of a w x h JPEG to the smallest of the 1/8, 1/4 and 1/2
+  // DCT scales whose upright image still covers coverW x coverH; the DCT size
+  // is decoded without any resampling. Leaves the target as it is when no
+  // such scale is smaller.
   static void computeCoverTarget(int w, int h, int orientation, float coverW, float coverH, int* targetW,
                                  int* targetH);
 

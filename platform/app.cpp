@@ -108,8 +108,8 @@ void onWindowShowHide(void*, Evas*, Evas_Object*, void*) {
 
 void unwatchWindow(Evas_Object* win);
 
-void onWindowDel(void*, Evas*, Evas_Object* win, void*) {
-  unwatchWindow(win);
+void onWindowDel(void*, const Efl_Event* ev) {
+  unwatchWindow(ev->object);
 }
 
 void unwatchWindow(Evas_Object* win) {
@@ -121,7 +121,7 @@ void unwatchWindow(Evas_Object* win) {
     evas_object_smart_callback_del_full(win, signal, onWindowSignal, signal);
   evas_object_event_callback_del(win, EVAS_CALLBACK_SHOW, onWindowShowHide);
   evas_object_event_callback_del(win, EVAS_CALLBACK_HIDE, onWindowShowHide);
-  evas_object_event_callback_del(win, EVAS_CALLBACK_DEL, onWindowDel);
+  efl_event_callback_del(win, EFL_EVENT_DEL, onWindowDel, nullptr);
 }
 
 void watchExistingWindows() {
@@ -350,5 +350,7 @@ void ui_app_watch_window(Evas_Object* window) {
     evas_object_smart_callback_add(window, signal, onWindowSignal, signal);
   evas_object_event_callback_add(window, EVAS_CALLBACK_SHOW, onWindowShowHide, nullptr);
   evas_object_event_callback_add(window, EVAS_CALLBACK_HIDE, onWindowShowHide, nullptr);
-  evas_object_event_callback_add(window, EVAS_CALLBACK_DEL, onWindowDel, nullptr);
+  // A window may go while its events are frozen; Evas then holds back its
+  // DEL callback, the object-level deletion event still comes.
+  efl_event_callback_add(window, EFL_EVENT_DEL, onWindowDel, nullptr);
 }

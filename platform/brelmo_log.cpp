@@ -34,11 +34,6 @@ std::string dbPath() {
   return platform_db::storePath("PICTAVO_USAGE_LOG_DB", "usage_log.db");
 }
 
-char* dupColumn(sqlite3_stmt* stmt, int column) {
-  const unsigned char* text = sqlite3_column_text(stmt, column);
-  return text ? strdup(reinterpret_cast<const char*>(text)) : nullptr;
-}
-
 const char* bundleValue(bundle* data, const char* key) {
   char* value = nullptr;
   return bundle_get_str(data, key, &value) == BUNDLE_ERROR_NONE ? value : nullptr;
@@ -115,29 +110,21 @@ extern "C" int brelmo_log_list(brelmo_log_record_s** records, size_t* count) {
   int rc =
       sqlite3_prepare_v2(db, "SELECT id, uri, app_id, feature, extra, value, time FROM usage_log ORDER BY id",
                          -1, &stmt, nullptr);
-  while (rc == SQLITE_OK || rc == SQLITE_ROW) {
-    rc = sqlite3_step(stmt);
-    if (rc != SQLITE_ROW) break;
+  rc = platform_db::readRows(stmt, rc, found, [](sqlite3_stmt* row) {
     brelmo_log_record_s record = {};
-    record.id = sqlite3_column_int64(stmt, 0);
-    record.uri = dupColumn(stmt, 1);
-    record.app_id = dupColumn(stmt, 2);
-    record.feature = dupColumn(stmt, 3);
-    record.extra = dupColumn(stmt, 4);
-    record.value = dupColumn(stmt, 5);
-    record.time = sqlite3_column_int64(stmt, 6);
-    found.push_back(record);
-  }
+    record.id = sqlite3_column_int64(row, 0);
+    record.uri = platform_db::dupColumn(row, 1);
+    record.app_id = platform_db::dupColumn(row, 2);
+    record.feature = platform_db::dupColumn(row, 3);
+    record.extra = platform_db::dupColumn(row, 4);
+    record.value = platform_db::dupColumn(row, 5);
+    record.time = sqlite3_column_int64(row, 6);
+    return record;
+  });
   sqlite3_finalize(stmt);
   sqlite3_close(db);
-  if (rc == SQLITE_DONE && !found.empty()) {
-    *records = static_cast<brelmo_log_record_s*>(calloc(found.size(), sizeof(brelmo_log_record_s)));
-    if (*records) {
-      memcpy(*records, found.data(), found.size() * sizeof(brelmo_log_record_s));
-      *count = found.size();
-      return BRELMO_LOG_ERROR_NONE;
-    }
-  }
+  if (rc == SQLITE_DONE && !found.empty() && platform_db::toCArray(found, records, count))
+    return BRELMO_LOG_ERROR_NONE;
   for (brelmo_log_record_s& record : found) {
     free(record.uri);
     free(record.app_id);

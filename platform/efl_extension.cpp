@@ -103,11 +103,12 @@ void onKeyDown(void*, Evas* evas, Evas_Object*, void* event_info) {
   if (handled) ev->event_flags = static_cast<Evas_Event_Flags>(ev->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
 }
 
-// The canvas is passed as data: while a canvas is torn down the callback's
-// own canvas argument cannot be relied on.
-void onCatcherDel(void* data, Evas*, Evas_Object* obj, void*) {
+// The canvas is passed as data: while a canvas is torn down the object's
+// own canvas cannot be relied on. Deletion is watched through the object-level
+// event because Evas holds back the DEL callback of objects with frozen events.
+void onCatcherDel(void* data, const Efl_Event* ev) {
   auto it = gCatchers.find(static_cast<Evas*>(data));
-  if (it != gCatchers.end() && it->second == obj) gCatchers.erase(it);
+  if (it != gCatchers.end() && it->second == ev->object) gCatchers.erase(it);
 }
 
 void ensureCatcher(Evas* evas) {
@@ -129,7 +130,7 @@ void ensureCatcher(Evas* evas) {
     for (size_t i = 0; i < 2; ++i)
       if (!evas_object_key_grab(catcher, keys[i], 0, 0, EINA_FALSE)) LYLOG_W("Cannot grab %s", keys[i]);
   evas_object_event_callback_add(catcher, EVAS_CALLBACK_KEY_DOWN, onKeyDown, nullptr);
-  evas_object_event_callback_add(catcher, EVAS_CALLBACK_DEL, onCatcherDel, evas);
+  efl_event_callback_add(catcher, EFL_EVENT_DEL, onCatcherDel, evas);
   gCatchers[evas] = catcher;
 }
 
@@ -139,8 +140,8 @@ void onObjectShow(void*, Evas*, Evas_Object* obj, void*) {
 
 void removeRecord(Evas_Object* obj);
 
-void onObjectDel(void*, Evas*, Evas_Object* obj, void*) {
-  removeRecord(obj);
+void onObjectDel(void*, const Efl_Event* ev) {
+  removeRecord(ev->object);
 }
 
 void removeRecord(Evas_Object* obj) {
@@ -149,7 +150,7 @@ void removeRecord(Evas_Object* obj) {
   delete *it;
   gRecords.erase(it);
   evas_object_event_callback_del(obj, EVAS_CALLBACK_SHOW, onObjectShow);
-  evas_object_event_callback_del(obj, EVAS_CALLBACK_DEL, onObjectDel);
+  efl_event_callback_del(obj, EFL_EVENT_DEL, onObjectDel, nullptr);
 }
 
 }  // namespace
@@ -166,7 +167,10 @@ void eext_object_event_callback_add(Evas_Object* obj, Eext_Callback_Type type, E
     record = new ObjectRecord{obj, ++gStamp, {}};
     gRecords.push_back(record);
     evas_object_event_callback_add(obj, EVAS_CALLBACK_SHOW, onObjectShow, nullptr);
-    evas_object_event_callback_add(obj, EVAS_CALLBACK_DEL, onObjectDel, nullptr);
+    // A record must go even when the object dies with its events frozen
+    // (Evas then holds back its DEL callback): its callbacks would be
+    // dispatched to a deleted object.
+    efl_event_callback_add(obj, EFL_EVENT_DEL, onObjectDel, nullptr);
   }
   record->callbacks.push_back({type, func, data});
 }

@@ -35,11 +35,6 @@ std::string dbPath() {
   return platform_db::storePath("PICTAVO_MEDIA_DB", "media.db");
 }
 
-char* dupColumn(sqlite3_stmt* stmt, int column) {
-  const unsigned char* text = sqlite3_column_text(stmt, column);
-  return text ? strdup(reinterpret_cast<const char*>(text)) : nullptr;
-}
-
 void freeStrings(media_info_s& row) {
   free(row.path);
   free(row.mime_type);
@@ -126,31 +121,23 @@ extern "C" int media_content_list(const char* path, media_info_s** rows, size_t*
   std::vector<media_info_s> found;
   int rc = sqlite3_prepare_v2(db, sql, -1, &stmt, nullptr);
   if (rc == SQLITE_OK && path) sqlite3_bind_text(stmt, 1, path, -1, SQLITE_TRANSIENT);
-  while (rc == SQLITE_OK || rc == SQLITE_ROW) {
-    rc = sqlite3_step(stmt);
-    if (rc != SQLITE_ROW) break;
+  rc = platform_db::readRows(stmt, rc, found, [](sqlite3_stmt* columns) {
     media_info_s row = {};
-    row.path = dupColumn(stmt, 0);
-    row.mime_type = dupColumn(stmt, 1);
-    row.size = sqlite3_column_int64(stmt, 2);
-    row.width = sqlite3_column_int(stmt, 3);
-    row.height = sqlite3_column_int(stmt, 4);
-    row.modified_time = sqlite3_column_int64(stmt, 5);
-    row.added_time = sqlite3_column_int64(stmt, 6);
-    found.push_back(row);
-  }
+    row.path = platform_db::dupColumn(columns, 0);
+    row.mime_type = platform_db::dupColumn(columns, 1);
+    row.size = sqlite3_column_int64(columns, 2);
+    row.width = sqlite3_column_int(columns, 3);
+    row.height = sqlite3_column_int(columns, 4);
+    row.modified_time = sqlite3_column_int64(columns, 5);
+    row.added_time = sqlite3_column_int64(columns, 6);
+    return row;
+  });
   sqlite3_finalize(stmt);
   if (db != gDb) sqlite3_close(db);
   int result = rc == SQLITE_DONE ? MEDIA_CONTENT_ERROR_NONE : MEDIA_CONTENT_ERROR_DB_FAILED;
   if (result == MEDIA_CONTENT_ERROR_NONE && !found.empty()) {
-    *rows = static_cast<media_info_s*>(calloc(found.size(), sizeof(media_info_s)));
-    if (!*rows) {
-      result = MEDIA_CONTENT_ERROR_OUT_OF_MEMORY;
-    } else {
-      memcpy(*rows, found.data(), found.size() * sizeof(media_info_s));
-      *count = found.size();
-      return result;
-    }
+    if (platform_db::toCArray(found, rows, count)) return result;
+    result = MEDIA_CONTENT_ERROR_OUT_OF_MEMORY;
   }
   for (media_info_s& row : found) freeStrings(row);
   return result;

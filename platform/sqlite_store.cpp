@@ -1,6 +1,7 @@
 #include "platform/sqlite_store.h"
 
 #include <cstdlib>
+#include <cstring>
 
 #include "common/CLyLog.h"
 #include "platform/core/app_common.h"
@@ -48,6 +49,11 @@ sqlite3* openStore(const std::string& path, const char* schema) {
     return nullptr;
   }
   return db;
+}
+
+char* dupColumn(sqlite3_stmt* stmt, int column) {
+  const unsigned char* text = sqlite3_column_text(stmt, column);
+  return text ? strdup(reinterpret_cast<const char*>(text)) : nullptr;
 }
 
 }  // namespace platform_db

@@ -251,62 +251,63 @@ void setIf(int* out, int value) {
   if (out) *out = value;
 }
 
+// Colour and font tables load, drop and switch the same way; `Slot` says
+// which half of the parse state a table fills.
+template <typename Table, Table* ParseState::*Slot>
+Table* addTable(const char* file) {
+  auto* table = new (std::nothrow) Table;
+  if (!table) return nullptr;
+  ParseState state;
+  state.*Slot = table;
+  if (!parseTable(file, state)) {
+    delete table;
+    return nullptr;
+  }
+  return table;
+}
+
+template <typename Table>
+int deleteTable(Table* table, Table*& current) {
+  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
+  std::lock_guard<std::mutex> lock(gMutex);
+  if (current == table) current = nullptr;
+  delete table;
+  return UXT_THEME_ERROR_NONE;
+}
+
+template <typename Table>
+int setTable(Table* table, Table*& current) {
+  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
+  std::lock_guard<std::mutex> lock(gMutex);
+  current = table;
+  publishLocked();
+  return UXT_THEME_ERROR_NONE;
+}
+
 }  // namespace
 
 extern "C" Uxt_Theme_Color_Table* uxt_theme_add_color_table(const char* file) {
-  auto* table = new (std::nothrow) Uxt_Theme_Color_Table;
-  if (!table) return nullptr;
-  ParseState state;
-  state.colors = table;
-  if (!parseTable(file, state)) {
-    delete table;
-    return nullptr;
-  }
-  return table;
+  return addTable<Uxt_Theme_Color_Table, &ParseState::colors>(file);
 }
 
 extern "C" int uxt_theme_delete_color_table(Uxt_Theme_Color_Table* table) {
-  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
-  std::lock_guard<std::mutex> lock(gMutex);
-  if (gColorTable == table) gColorTable = nullptr;
-  delete table;
-  return UXT_THEME_ERROR_NONE;
+  return deleteTable(table, gColorTable);
 }
 
 extern "C" int uxt_theme_set_color_table(Uxt_Theme_Color_Table* table) {
-  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
-  std::lock_guard<std::mutex> lock(gMutex);
-  gColorTable = table;
-  publishLocked();
-  return UXT_THEME_ERROR_NONE;
+  return setTable(table, gColorTable);
 }
 
 extern "C" Uxt_Theme_Font_Table* uxt_theme_add_font_table(const char* file) {
-  auto* table = new (std::nothrow) Uxt_Theme_Font_Table;
-  if (!table) return nullptr;
-  ParseState state;
-  state.fonts = table;
-  if (!parseTable(file, state)) {
-    delete table;
-    return nullptr;
-  }
-  return table;
+  return addTable<Uxt_Theme_Font_Table, &ParseState::fonts>(file);
 }
 
 extern "C" int uxt_theme_delete_font_table(Uxt_Theme_Font_Table* table) {
-  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
-  std::lock_guard<std::mutex> lock(gMutex);
-  if (gFontTable == table) gFontTable = nullptr;
-  delete table;
-  return UXT_THEME_ERROR_NONE;
+  return deleteTable(table, gFontTable);
 }
 
 extern "C" int uxt_theme_set_font_table(Uxt_Theme_Font_Table* table) {
-  if (!table) return UXT_THEME_ERROR_INVALID_PARAMETER;
-  std::lock_guard<std::mutex> lock(gMutex);
-  gFontTable = table;
-  publishLocked();
-  return UXT_THEME_ERROR_NONE;
+  return setTable(table, gFontTable);
 }
 
 extern "C" int uxt_theme_set_style(int style) {

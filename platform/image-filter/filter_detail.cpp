@@ -115,7 +115,6 @@ __attribute__((target("avx2"))) int cartoonRowAvx2(const uint8_t* u, const uint8
   using namespace simd;
   const __m256i zero = _mm256_setzero_si256(), k255 = _mm256_set1_epi32(255), k310 = _mm256_set1_epi32(290);
   const __m256i ink24 = _mm256_set1_epi32(kInk), third = _mm256_set1_epi32(21846);
-  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
   int x = 0;
   for (; x + 8 <= width; x += 8) {
     const __m256i up = load8(u + (size_t)x * 4), px = load8(s + (size_t)x * 4);
@@ -138,9 +137,7 @@ __attribute__((target("avx2"))) int cartoonRowAvx2(const uint8_t* u, const uint8
     r = div255(_mm256_add_epi32(_mm256_mullo_epi32(r, keep), inkPart));
     g = div255(_mm256_add_epi32(_mm256_mullo_epi32(g, keep), inkPart));
     b = div255(_mm256_add_epi32(_mm256_mullo_epi32(b, keep), inkPart));
-    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
-    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
-    store8(d + (size_t)x * 4, out);
+    store8(d + (size_t)x * 4, pack<SR, SG, SB, SA>(r, g, b, px));
   }
   return x;
 }

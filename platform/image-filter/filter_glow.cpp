@@ -63,7 +63,7 @@ template <int SR, int SG, int SB, int SA>
 __attribute__((target("avx2"))) int glowRowAvx2(const uint8_t* u, uint8_t* d, int width,
                                                 const GlowTables& t) {
   using namespace simd;
-  const __m256i soften = _mm256_set1_epi32(t.soften), kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  const __m256i soften = _mm256_set1_epi32(t.soften);
   int x = 0;
   for (; x + 8 <= width; x += 8) {
     const __m256i up = load8(u + (size_t)x * 4), px = load8(d + (size_t)x * 4);
@@ -77,9 +77,7 @@ __attribute__((target("avx2"))) int glowRowAvx2(const uint8_t* u, uint8_t* d, in
     r = screen(r, _mm256_i32gather_epi32(t.glow[0], i0, 4));
     g = screen(g, _mm256_i32gather_epi32(t.glow[1], i1, 4));
     b = screen(b, _mm256_i32gather_epi32(t.glow[2], i2, 4));
-    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
-    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
-    store8(d + (size_t)x * 4, out);
+    store8(d + (size_t)x * 4, pack<SR, SG, SB, SA>(r, g, b, px));
   }
   return x;
 }
@@ -88,9 +86,7 @@ __attribute__((target("avx2"))) int glowRowAvx2(const uint8_t* u, uint8_t* d, in
 // Screens the enlarged blur over the destination, in place.
 void blendGlow(const Frame& f, const Blurred& b, const GlowBlend& gb) {
   Upsampler<4> up(b.small, b.factor, f.width, f.height);
-  std::vector<int> tables(3 * 256);
-  for (int k = 0; k < 3; ++k)
-    for (int i = 0; i < 256; ++i) tables[(size_t)k * 256 + (size_t)i] = gb.glow[k][i];
+  const std::vector<int> tables = simd::widenTables(gb.glow, 256);
   const GlowTables t{gb.soften, gb.fromLuma, {&tables[0], &tables[256], &tables[512]}};
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;

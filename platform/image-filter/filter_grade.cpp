@@ -5,6 +5,8 @@
 #include <memory>
 #include <vector>
 
+#include "platform/image-filter/filter_simd.h"
+
 #if defined(__x86_64__)
 #include <immintrin.h>
 #endif
@@ -84,8 +86,8 @@ __attribute__((target("avx2"))) inline __m256i matRow(const __m256i* mm, int k, 
 template <int SR, int SG, int SB, int SA>
 __attribute__((target("avx2"))) int gradeRowAvx2(const uint8_t* s, uint8_t* d, int from, int width,
                                                  const GradeRow& gr) {
-  const __m256i k255 = _mm256_set1_epi32(255), kRound = _mm256_set1_epi32(2048),
-                kAlpha = _mm256_set1_epi32((int)(255u << SA));
+  using namespace simd;
+  const __m256i k255 = _mm256_set1_epi32(255), kRound = _mm256_set1_epi32(2048);
   __m256i mm[9];
   for (int i = 0; i < 9; ++i) mm[i] = _mm256_set1_epi32(gr.m[i]);
   const int* t0 = reinterpret_cast<const int*>(gr.lut[0]);
@@ -94,10 +96,8 @@ __attribute__((target("avx2"))) int gradeRowAvx2(const uint8_t* s, uint8_t* d, i
   const __m256i vigRow = _mm256_set1_epi32(gr.vigRow);
   int x = from;
   for (; x + 8 <= width; x += 8) {
-    const __m256i px = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(s + (size_t)x * 4));
-    const __m256i r = _mm256_and_si256(_mm256_srli_epi32(px, SR), k255);
-    const __m256i g = _mm256_and_si256(_mm256_srli_epi32(px, SG), k255);
-    const __m256i b = _mm256_and_si256(_mm256_srli_epi32(px, SB), k255);
+    const __m256i px = load8(s + (size_t)x * 4);
+    const __m256i r = channel<SR>(px), g = channel<SG>(px), b = channel<SB>(px);
 
     __m256i o0 = _mm256_i32gather_epi32(t0, matRow(mm, 0, r, g, b, kRound), 4);
     __m256i o1 = _mm256_i32gather_epi32(t1, matRow(mm, 3, r, g, b, kRound), 4);
@@ -118,10 +118,7 @@ __attribute__((target("avx2"))) int gradeRowAvx2(const uint8_t* s, uint8_t* d, i
       o1 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o1, n), zero), k255);
       o2 = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(o2, n), zero), k255);
     }
-    __m256i out = _mm256_or_si256(_mm256_slli_epi32(o0, SR), _mm256_slli_epi32(o1, SG));
-    out = _mm256_or_si256(out, _mm256_slli_epi32(o2, SB));
-    out = _mm256_or_si256(out, _mm256_and_si256(px, kAlpha));
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(d + (size_t)x * 4), out);
+    store8(d + (size_t)x * 4, pack<SR, SG, SB, SA>(o0, o1, o2, px));
   }
   return x;
 }
@@ -299,19 +296,23 @@ inline uint32_t selectivePixel(uint32_t px, const SelectiveRow& sr) {
   w = w < 0 ? 0 : (w > 255 ? 255 : w);
   const int sat = sr.satO + (((sr.satT - sr.satO) * w) >> 8);
   const int k = 256 - ((sr.dark * w) >> 8);
-  const int nr = ((l + (((r - l) * sat) >> 8)) * k) >> 8;
-  const int ng = ((l + (((g - l) * sat) >> 8)) * k) >> 8;
-  const int nb = ((l + (((b - l) * sat) >> 8)) * k) >> 8;
-  return sr.lut[0][nr] << SR | sr.lut[1][ng] << SG | sr.lut[2][nb] << SB | (px & (255u << SA));
+  auto adjust = [&](int c) { return ((l + (((c - l) * sat) >> 8)) * k) >> 8; };
+  return sr.lut[0][adjust(r)] << SR | sr.lut[1][adjust(g)] << SG | sr.lut[2][adjust(b)] << SB |
+         (px & (255u << SA));
 }
 
 #if defined(__x86_64__)
+// ((l + ((c - l) * sat >> 8)) * k) >> 8, as the plain pixel does.
+__attribute__((target("avx2"))) inline __m256i adjustSelective(__m256i c, __m256i l, __m256i sat, __m256i k) {
+  const __m256i toward = _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(c, l), sat), 8);
+  return _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_add_epi32(l, toward), k), 8);
+}
+
 template <int SR, int SG, int SB, int SA>
 __attribute__((target("avx2"))) int selectiveRowAvx2(const uint8_t* s, uint8_t* d, int from, int width,
                                                      const SelectiveRow& sr) {
+  using namespace simd;
   const __m256i k255 = _mm256_set1_epi32(255), zero = _mm256_setzero_si256();
-  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
-  const __m256i wR = _mm256_set1_epi32(54), wG = _mm256_set1_epi32(183), wB = _mm256_set1_epi32(19);
   const __m256i satO = _mm256_set1_epi32(sr.satO), satD = _mm256_set1_epi32(sr.satT - sr.satO);
   const __m256i dark = _mm256_set1_epi32(sr.dark), k256 = _mm256_set1_epi32(256);
   const int* t0 = reinterpret_cast<const int*>(sr.lut[0]);
@@ -319,14 +320,9 @@ __attribute__((target("avx2"))) int selectiveRowAvx2(const uint8_t* s, uint8_t* 
   const int* t2 = reinterpret_cast<const int*>(sr.lut[2]);
   int x = from;
   for (; x + 8 <= width; x += 8) {
-    const __m256i px = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(s + (size_t)x * 4));
-    const __m256i r = _mm256_and_si256(_mm256_srli_epi32(px, SR), k255);
-    const __m256i g = _mm256_and_si256(_mm256_srli_epi32(px, SG), k255);
-    const __m256i b = _mm256_and_si256(_mm256_srli_epi32(px, SB), k255);
-    const __m256i l = _mm256_srai_epi32(
-        _mm256_add_epi32(_mm256_add_epi32(_mm256_mullo_epi32(r, wR), _mm256_mullo_epi32(g, wG)),
-                         _mm256_mullo_epi32(b, wB)),
-        8);
+    const __m256i px = load8(s + (size_t)x * 4);
+    const __m256i r = channel<SR>(px), g = channel<SG>(px), b = channel<SB>(px);
+    const __m256i l = luma(r, g, b);
     __m256i w;
     if (sr.greens) {
       w = _mm256_mullo_epi32(_mm256_sub_epi32(g, _mm256_max_epi32(r, b)), _mm256_set1_epi32(5));
@@ -337,23 +333,10 @@ __attribute__((target("avx2"))) int selectiveRowAvx2(const uint8_t* s, uint8_t* 
     w = _mm256_min_epi32(_mm256_max_epi32(w, zero), k255);
     const __m256i sat = _mm256_add_epi32(satO, _mm256_srai_epi32(_mm256_mullo_epi32(satD, w), 8));
     const __m256i k = _mm256_sub_epi32(k256, _mm256_srai_epi32(_mm256_mullo_epi32(dark, w), 8));
-    const __m256i nr = _mm256_srai_epi32(
-        _mm256_mullo_epi32(
-            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(r, l), sat), 8)), k),
-        8);
-    const __m256i ng = _mm256_srai_epi32(
-        _mm256_mullo_epi32(
-            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(g, l), sat), 8)), k),
-        8);
-    const __m256i nb = _mm256_srai_epi32(
-        _mm256_mullo_epi32(
-            _mm256_add_epi32(l, _mm256_srai_epi32(_mm256_mullo_epi32(_mm256_sub_epi32(b, l), sat), 8)), k),
-        8);
-    __m256i out = _mm256_or_si256(_mm256_slli_epi32(_mm256_i32gather_epi32(t0, nr, 4), SR),
-                                  _mm256_slli_epi32(_mm256_i32gather_epi32(t1, ng, 4), SG));
-    out = _mm256_or_si256(out, _mm256_slli_epi32(_mm256_i32gather_epi32(t2, nb, 4), SB));
-    out = _mm256_or_si256(out, _mm256_and_si256(px, kAlpha));
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(d + (size_t)x * 4), out);
+    store8(d + (size_t)x * 4,
+           pack<SR, SG, SB, SA>(_mm256_i32gather_epi32(t0, adjustSelective(r, l, sat, k), 4),
+                                _mm256_i32gather_epi32(t1, adjustSelective(g, l, sat, k), 4),
+                                _mm256_i32gather_epi32(t2, adjustSelective(b, l, sat, k), 4), px));
   }
   return x;
 }

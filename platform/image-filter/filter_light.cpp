@@ -84,7 +84,6 @@ __attribute__((target("avx2"))) int flareRowAvx2(const uint8_t* s, uint8_t* d, i
                                                  const int32_t* dx2, int shift, const int* const* t) {
   using namespace simd;
   const __m256i vdy2 = _mm256_set1_epi32(dy2), maxIdx = _mm256_set1_epi32(4095);
-  const __m256i kAlpha = _mm256_set1_epi32((int)(255u << SA));
   const __m128i vshift = _mm_cvtsi32_si128(shift);
   int x = 0;
   for (; x + 8 <= width; x += 8) {
@@ -94,9 +93,7 @@ __attribute__((target("avx2"))) int flareRowAvx2(const uint8_t* s, uint8_t* d, i
     const __m256i r = screen(channel<SR>(px), _mm256_i32gather_epi32(t[0], i, 4));
     const __m256i g = screen(channel<SG>(px), _mm256_i32gather_epi32(t[1], i, 4));
     const __m256i b = screen(channel<SB>(px), _mm256_i32gather_epi32(t[2], i, 4));
-    __m256i out = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
-    out = _mm256_or_si256(_mm256_or_si256(out, _mm256_slli_epi32(b, SB)), _mm256_and_si256(px, kAlpha));
-    store8(d + (size_t)x * 4, out);
+    store8(d + (size_t)x * 4, pack<SR, SG, SB, SA>(r, g, b, px));
   }
   return x;
 }
@@ -152,9 +149,7 @@ void lookLightFlare(const Frame& f) {
   // Squared distances fit 32 bits: sides are at most 16384.
   std::vector<int32_t> dx2((size_t)f.width);
   for (int x = 0; x < f.width; ++x) dx2[(size_t)x] = (int32_t)std::llround((x - sx) * (x - sx));
-  std::vector<int> tables(3 * 4096);
-  for (int k = 0; k < 3; ++k)
-    for (int i = 0; i < 4096; ++i) tables[(size_t)k * 4096 + (size_t)i] = glow[k][(size_t)i];
+  const std::vector<int> tables = simd::widenTables(glow, 4096);
   const int* t[3] = {&tables[0], &tables[4096], &tables[8192]};
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;

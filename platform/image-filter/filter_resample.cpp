@@ -21,9 +21,32 @@ int boxRadiusForSigma(double sigma) {
   return r < 1 ? 1 : r;
 }
 
-void downscale(const Frame& f, int factor, Rgba& out) {
+namespace {
+
+// `out` sized to hold one pixel per `factor` x `factor` block of the frame
+// (edge blocks may be smaller); its width.
+template <typename Image>
+int sizeForBlocks(const Frame& f, int factor, Image& out) {
   const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
   out.resize(sw, sh);
+  return sw;
+}
+
+// fn(by, y0, y1) for each band of `factor` source rows.
+template <typename Fn>
+void forEachBand(const Frame& f, int factor, Fn fn) {
+  for (int y0 = 0, by = 0; y0 < f.height; y0 += factor, ++by) fn(by, y0, std::min(f.height, y0 + factor));
+}
+
+// Source pixels in block `bx` of a band of `rows` rows.
+uint32_t blockArea(const Frame& f, int factor, int bx, int rows) {
+  return (uint32_t)(rows * (std::min(f.width, (bx + 1) * factor) - bx * factor));
+}
+
+}  // namespace
+
+void downscale(const Frame& f, int factor, Rgba& out) {
+  const int sw = sizeForBlocks(f, factor, out);
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
     if (factor == 1) {
@@ -43,10 +66,9 @@ void downscale(const Frame& f, int factor, Rgba& out) {
       // Even and odd bytes of whole pixels are summed in 16-bit lanes; a
       // block of at most 16 x 16 pixels cannot overflow them.
       std::vector<uint32_t> even((size_t)sw), odd((size_t)sw);
-      for (int by = 0; by < sh; ++by) {
+      forEachBand(f, factor, [&](int by, int y0, int y1) {
         std::fill(even.begin(), even.end(), 0u);
         std::fill(odd.begin(), odd.end(), 0u);
-        const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
         for (int y = y0; y < y1; ++y) {
           const uint8_t* s = f.srcRow(y);
           for (int bx = 0; bx < sw; ++bx) {
@@ -64,8 +86,7 @@ void downscale(const Frame& f, int factor, Rgba& out) {
         uint8_t* d = out.row(by);
         const int rows = y1 - y0;
         for (int bx = 0; bx < sw; ++bx) {
-          const int cols = std::min(f.width, (bx + 1) * factor) - bx * factor;
-          const uint32_t n = (uint32_t)(rows * cols);
+          const uint32_t n = blockArea(f, factor, bx, rows);
           const uint32_t e = even[(size_t)bx], o = odd[(size_t)bx];
           const uint32_t byteSum[4] = {e & 0xffffu, o & 0xffffu, e >> 16, o >> 16};
           d[bx * 4 + 0] = (uint8_t)((byteSum[c.r] + n / 2) / n);
@@ -73,13 +94,12 @@ void downscale(const Frame& f, int factor, Rgba& out) {
           d[bx * 4 + 2] = (uint8_t)((byteSum[c.b] + n / 2) / n);
           d[bx * 4 + 3] = (uint8_t)((byteSum[c.a] + n / 2) / n);
         }
-      }
+      });
       return;
     }
     std::vector<uint32_t> acc((size_t)sw * 4);
-    for (int by = 0; by < sh; ++by) {
+    forEachBand(f, factor, [&](int by, int y0, int y1) {
       std::fill(acc.begin(), acc.end(), 0u);
-      const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
       for (int y = y0; y < y1; ++y) {
         const uint8_t* s = f.srcRow(y);
         for (int bx = 0; bx < sw; ++bx) {
@@ -102,17 +122,15 @@ void downscale(const Frame& f, int factor, Rgba& out) {
       uint8_t* d = out.row(by);
       const int rows = y1 - y0;
       for (int bx = 0; bx < sw; ++bx) {
-        const int cols = std::min(f.width, (bx + 1) * factor) - bx * factor;
-        const uint32_t n = (uint32_t)(rows * cols);
+        const uint32_t n = blockArea(f, factor, bx, rows);
         for (int k = 0; k < 4; ++k) d[bx * 4 + k] = (uint8_t)((acc[(size_t)bx * 4 + k] + n / 2) / n);
       }
-    }
+    });
   });
 }
 
 void downscaleLuma(const Frame& f, int factor, Gray& out) {
-  const int sw = (f.width + factor - 1) / factor, sh = (f.height + factor - 1) / factor;
-  out.resize(sw, sh);
+  const int sw = sizeForBlocks(f, factor, out);
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
     if (factor == 1) {
@@ -124,9 +142,8 @@ void downscaleLuma(const Frame& f, int factor, Gray& out) {
       return;
     }
     std::vector<uint32_t> acc((size_t)sw);
-    for (int by = 0; by < sh; ++by) {
+    forEachBand(f, factor, [&](int by, int y0, int y1) {
       std::fill(acc.begin(), acc.end(), 0u);
-      const int y0 = by * factor, y1 = std::min(f.height, y0 + factor);
       for (int y = y0; y < y1; ++y) {
         const uint8_t* s = f.srcRow(y);
         for (int x = 0; x < f.width; ++x, s += 4)
@@ -135,10 +152,10 @@ void downscaleLuma(const Frame& f, int factor, Gray& out) {
       uint8_t* d = out.row(by);
       const int rows = y1 - y0;
       for (int bx = 0; bx < sw; ++bx) {
-        const uint32_t n = (uint32_t)(rows * (std::min(f.width, (bx + 1) * factor) - bx * factor));
+        const uint32_t n = blockArea(f, factor, bx, rows);
         d[bx] = (uint8_t)((acc[(size_t)bx] + n / 2) / n);
       }
-    }
+    });
   });
 }
 

@@ -3,6 +3,23 @@
 // kernels. Every vector kernel has a plain twin computing the same integers;
 // the vector one runs when simdAvx2() says so.
 
+#include <cstddef>
+#include <vector>
+
+namespace imgfilter::simd {
+
+// Three per-channel tables of `n` entries widened to ints in one block, the
+// form the vector gathers read.
+template <typename Tables>
+std::vector<int> widenTables(const Tables& tables, size_t n) {
+  std::vector<int> ints(3 * n);
+  for (size_t k = 0; k < 3; ++k)
+    for (size_t i = 0; i < n; ++i) ints[k * n + i] = tables[k][i];
+  return ints;
+}
+
+}  // namespace imgfilter::simd
+
 #if defined(__x86_64__)
 #include <immintrin.h>
 
@@ -33,6 +50,14 @@ __attribute__((target("avx2"))) inline __m256i luma(__m256i r, __m256i g, __m256
   const __m256i s = _mm256_add_epi32(_mm256_mullo_epi32(r, _mm256_set1_epi32(54)),
                                      _mm256_mullo_epi32(g, _mm256_set1_epi32(183)));
   return _mm256_srai_epi32(_mm256_add_epi32(s, _mm256_mullo_epi32(b, _mm256_set1_epi32(19))), 8);
+}
+
+// Eight pixels from channels r, g, b (ints 0..255) and the alpha of `px`.
+template <int SR, int SG, int SB, int SA>
+__attribute__((target("avx2"))) inline __m256i pack(__m256i r, __m256i g, __m256i b, __m256i px) {
+  const __m256i rg = _mm256_or_si256(_mm256_slli_epi32(r, SR), _mm256_slli_epi32(g, SG));
+  return _mm256_or_si256(_mm256_or_si256(rg, _mm256_slli_epi32(b, SB)),
+                         _mm256_and_si256(px, _mm256_set1_epi32((int)(255u << SA))));
 }
 
 __attribute__((target("avx2"))) inline __m256i load8(const uint8_t* p) {

@@ -3,7 +3,6 @@
 #include <Elementary.h>
 #include <gtest/gtest.h>
 #include <signal.h>
-#include <sys/stat.h>
 
 #include <functional>
 #include <string>
@@ -21,19 +20,6 @@
 using pictavo::test::LogCapture;
 
 namespace {
-
-// elementary keeps its run folder under $HOME, which a fresh build tree may
-// not have yet.
-const bool gHomeReady = [] {
-  const char* home = getenv("HOME");
-  if (!home || !*home) return false;
-  std::string path;
-  for (const char* p = home; *p; ++p) {
-    path += *p;
-    if (p[1] == '/' || p[1] == '\0') mkdir(path.c_str(), 0755);
-  }
-  return true;
-}();
 
 // Runs steps on the application's main loop, one after another with the
 // given delays; the last step should end the application.

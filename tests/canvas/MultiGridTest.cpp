@@ -9,6 +9,7 @@
 #include <cmath>
 #include <cstdlib>
 #include <string>
+#include <vector>
 
 #include "app-assist/WWindowController.h"
 #include "codec/Bitmap.h"
@@ -398,11 +399,79 @@ TEST_F(MultiGridTest, CopyingPartialRedrawsEqualAFullRedraw) {
     const std::string partial = snapshot();
     cairo_save(cr);
     cairo_set_operator(cr, CAIRO_OPERATOR_SOURCE);
-    Peer::draw(g);  // clears, then draws every cell the same way
+    Peer::updateGridImages(g);  // clears, then draws every cell with its crop
     cairo_restore(cr);
     EXPECT_TRUE(partial == snapshot()) << "divider at " << s[0] << ", " << s[1];
   }
   g->destroy();
+}
+
+// During a handler drag a cell whose scale holds keeps (or moves) its pixels
+// and draws only what is new. Step by step the canvas must match a control
+// that draws everything afresh: the same shapes (alpha) exactly, and colours
+// within a texel of smooth photos (a kept pixel may show the neighbouring
+// texel; the release redraw puts every texel back).
+TEST_F(MultiGridTest, ReusedPixelsMatchAFreshDrawing) {
+  // Smooth, no wrap-around: neighbouring texels differ by at most 1.
+  auto gradient = [](int w, int h, int shift) {
+    Bitmap* b = BitmapFactory::createBitmap(w, h, BITMAP_FORMAT_BGRA);
+    auto* p = reinterpret_cast<uint32_t*>(b->getPixels());
+    for (int y = 0; y < h; y++)
+      for (int x = 0; x < w; x++)
+        p[y * w + x] = 0xFF000000u | (uint32_t)(x * 255 / w) << 16 | (uint32_t)(y * 255 / h) << 8 |
+                       (uint32_t)((x + y + shift) * 255 / (w + h + shift));
+    return b;
+  };
+  addCell(mCells, 0, 0, 0.5f, 1);
+  addCell(mCells, 0.5f, 0, 1, 1);
+  mItems.add(itemOf(gradient(500, 600, 0)));  // portrait crops: they keep their height
+  mItems.add(itemOf(gradient(520, 640, 40)));
+  auto* reusing = makeGrid(601, 601, true);
+  auto* fresh = makeGrid(601, 601, true);
+  for (CLyMultiGrid* g : {reusing, fresh}) {
+    g->setBorderMarginValue(3);
+    g->setBorderRoundnessValue(11);
+    Peer::impl(g)->canvas->setFilter(CAIRO_FILTER_FAST);
+  }
+  auto copying = [](CLyMultiGrid* g, void (*draw)(CLyMultiGrid*)) {
+    cairo_t* cr = Peer::impl(g)->canvas->getContext();
+    cairo_save(cr);
+    cairo_set_operator(cr, CAIRO_OPERATOR_SOURCE);
+    draw(g);
+    cairo_restore(cr);
+  };
+  auto pixelsOf = [](CLyMultiGrid* g) {
+    cairo_surface_t* s = Peer::impl(g)->canvas->getSurface();
+    cairo_surface_flush(s);
+    const auto* d = reinterpret_cast<const uint32_t*>(cairo_image_surface_get_data(s));
+    return std::vector<uint32_t>(
+        d, d + cairo_image_surface_get_stride(s) / 4 * cairo_image_surface_get_height(s));
+  };
+  LogCapture log;
+  for (float divider : {0.45f, 0.40f, 0.48f, 0.57f, 0.53f, 0.53f, 0.31f}) {
+    mCells.getItem(0)->x2 = divider;
+    mCells.getItem(1)->x1 = divider;
+    Peer::impl(reusing)->reusePixels = true;
+    copying(reusing, Peer::drawGridImages);
+    Peer::impl(reusing)->reusePixels = false;
+    copying(fresh, Peer::updateGridImages);
+    const std::vector<uint32_t> a = pixelsOf(reusing), b = pixelsOf(fresh);
+    ASSERT_EQ(a.size(), b.size());
+    size_t shape = 0, colour = 0;
+    for (size_t i = 0; i < a.size(); i++) {
+      if ((a[i] >> 24) != (b[i] >> 24)) shape++;
+      for (int c = 0; c < 24; c += 8)
+        if (std::abs((int)(a[i] >> c & 255) - (int)(b[i] >> c & 255)) > 3) {
+          colour++;
+          break;
+        }
+    }
+    EXPECT_EQ(0u, shape) << "divider at " << divider;
+    EXPECT_EQ(0u, colour) << "divider at " << divider;
+  }
+  EXPECT_GT(log.count("Reuse pixels of cell"), 4u) << "the steps kept pixels";
+  reusing->destroy();
+  fresh->destroy();
 }
 
 TEST_F(MultiGridTest, OneCellUpdateTouchesOnlyThatCell) {

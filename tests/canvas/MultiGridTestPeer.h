@@ -13,6 +13,7 @@ class CLyMultiGridTestPeer {
   }
   static void draw(CLyMultiGrid* g) { g->__draw(); }
   static void drawGridImages(CLyMultiGrid* g) { g->__drawGridImages(); }
+  static void updateGridImages(CLyMultiGrid* g) { g->__updateGridImages(); }
   static void updateImage(CLyMultiGrid* g, int i, const CLyFloatRectangle& d, bool recreate) {
     g->__updateImage(i, d, recreate);
   }

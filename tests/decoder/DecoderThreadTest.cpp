@@ -312,9 +312,13 @@ TEST_F(DecoderThread, SixPhotosAtOnce) {
 // image still covers the cell, never above what the screen bound gives.
 TEST_F(DecoderThread, CoverTargetsTakeTheSmallestCoveringScale) {
   int w = 2000, h = 1500;  // 4000 x 3000 within 2000 x 2000
+  CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 667, 700, &w, &h);
+  EXPECT_EQ(w, 1000);  // 1/4
+  EXPECT_EQ(h, 750);
+  w = 2000, h = 1500;  // 1000 rows: 1/4 (750) does not cover, 3/8 is not used, 1/2 is the bound
   CLyImageDecoderThread::computeCoverTarget(4000, 3000, 1, 667, 1000, &w, &h);
-  EXPECT_EQ(w, 1500);  // 3/8: 1125 rows cover 1000, 1/4 (750) would not
-  EXPECT_EQ(h, 1125);
+  EXPECT_EQ(w, 2000);
+  EXPECT_EQ(h, 1500);
   w = 2000, h = 1500;
   CLyImageDecoderThread::computeCoverTarget(4000, 3000, 6, 667, 1000, &w, &h);
   EXPECT_EQ(w, 1000);  // upright 750 x 1000 covers 667 x 1000
@@ -366,8 +370,8 @@ TEST_F(DecoderThread, ACoverSizeDecodesAtTheDctScaleUpright) {
   }
   Bitmap* plain = c.result(0);
   ASSERT_TRUE(plain);
-  EXPECT_EQ(plain->getWidth(), 600);  // 3/8: 450 rows cover 400
-  EXPECT_EQ(plain->getHeight(), 450);
+  EXPECT_EQ(plain->getWidth(), 800);  // 1/2: 600 rows cover 400, 1/4 (300) would not
+  EXPECT_EQ(plain->getHeight(), 600);
   EXPECT_EQ(corners(*plain), "rgbw");
   Bitmap* six = c.result(1);
   ASSERT_TRUE(six);

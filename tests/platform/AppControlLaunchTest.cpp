@@ -11,40 +11,19 @@
 #include "platform/app_control.h"
 #include "platform/app_control_apps.h"
 #include "platform/app_control_launch_private.h"
+#include "tests/support/AppControlReplies.h"
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::LogCapture;
 using pictavo::test::runMainLoopUntil;
 using pictavo::test::TempDir;
-using pictavo::test::writeBytes;
+using pictavo::test::writeFileBytes;
 using pictavo::test::writeTestPng;
 
 namespace {
 
-struct Replies {
-  int count = 0;
-  app_control_result_e result = APP_CONTROL_RESULT_APP_STARTED;
-  std::vector<std::string> selected;
-  bool hadArray = false;
-  app_control_h request = nullptr;
-};
-
-void onReply(app_control_h request, app_control_h reply, app_control_result_e result, void* data) {
-  auto* replies = static_cast<Replies*>(data);
-  ++replies->count;
-  replies->result = result;
-  replies->request = request;
-  replies->selected.clear();
-  char** values = nullptr;
-  int length = 0;
-  replies->hadArray = app_control_get_extra_data_array(reply, APP_CONTROL_DATA_SELECTED, &values, &length) ==
-                      APP_CONTROL_ERROR_NONE;
-  for (int i = 0; i < length; ++i) {
-    if (values[i]) replies->selected.emplace_back(values[i]);
-    free(values[i]);
-  }
-  free(values);
-}
+using Replies = pictavo::test::AppControlReplies;
+constexpr auto onReply = &Replies::onReply;
 
 app_control_h pickRequest(const char* launchType, const char* maxCount) {
   app_control_h request = nullptr;
@@ -123,7 +102,7 @@ TEST_F(AppControlLaunchTest, PickerEnforcesMaxCountAndSkipsNonImages) {
   EXPECT_FALSE(image_picker_submit(mImages));
   EXPECT_TRUE(log.contains("(2)"));
   EXPECT_NE(image_picker_get_window(), nullptr) << "a refused choice keeps the picker open";
-  ASSERT_TRUE(writeBytes(mDir.file("text.png"), "not an image"));
+  ASSERT_TRUE(writeFileBytes(mDir.file("text.png"), "not an image"));
   EXPECT_FALSE(image_picker_submit({mDir.file("text.png")}));
   EXPECT_FALSE(image_picker_submit({mDir.file("gone.png")}));
   ASSERT_TRUE(image_picker_submit({mImages[1], mDir.file("text.png")}));
@@ -198,7 +177,7 @@ TEST_F(AppControlLaunchTest, UnknownApplicationsAndBadRequestsFail) {
 TEST_F(AppControlLaunchTest, ShareHandsTheFileToTheDesktopOpener) {
   std::string marker = mDir.file("opened.txt");
   std::string script = mDir.file("opener.sh");
-  ASSERT_TRUE(writeBytes(script, "#!/bin/sh\necho \"$1\" > '" + marker + "'\n"));
+  ASSERT_TRUE(writeFileBytes(script, "#!/bin/sh\necho \"$1\" > '" + marker + "'\n"));
   chmod(script.c_str(), 0755);
   setenv("PICTAVO_SHARE_COMMAND", script.c_str(), 1);
 

@@ -103,3 +103,18 @@ TEST_F(EextKeysTest, BadArgumentsAreIgnored) {
   press(win, "Escape");
   EXPECT_TRUE(gCalls.empty());
 }
+
+TEST_F(EextKeysTest, AnObjectDeletedWithFrozenEventsIsForgotten) {
+  // Evas holds back the DEL callback of an object whose events are frozen;
+  // its record must go all the same, or keys keep visiting a dead object.
+  Evas_Object* lower = box();
+  Evas_Object* frozen = box();
+  eext_object_event_callback_add(lower, EEXT_CALLBACK_BACK, record, (void*)"lower");
+  eext_object_event_callback_add(frozen, EEXT_CALLBACK_BACK, record, (void*)"frozen");
+  evas_object_freeze_events_set(frozen, EINA_TRUE);
+  evas_object_del(frozen);
+  // Only the address is compared: nothing is registered for it any more.
+  EXPECT_EQ(eext_object_event_callback_del(frozen, EEXT_CALLBACK_BACK, record), nullptr);
+  press(win, "Escape");
+  EXPECT_EQ(gCalls, (std::vector<std::string>{"lower"}));
+}

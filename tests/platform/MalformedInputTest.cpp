@@ -15,7 +15,7 @@
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::TempDir;
-using pictavo::test::writeBytes;
+using pictavo::test::writeFileBytes;
 
 namespace {
 
@@ -52,7 +52,7 @@ TEST(MalformedInputTest, HeaderProbeNeverTrustsDamagedHeaders) {
   platform_image::ProbeResult result;
   for (const auto& [bytes, w, h] : {std::tuple{png, 30, 20}, std::tuple{gif, 30, 20}, std::tuple{bmp, 30, 20},
                                     std::tuple{wbmp, 30, 20}, std::tuple{jpeg, 30, 20}}) {
-    ASSERT_TRUE(writeBytes(dir.file("sample"), bytes));
+    ASSERT_TRUE(writeFileBytes(dir.file("sample"), bytes));
     ASSERT_TRUE(platform_image::probe(dir.file("sample").c_str(), result)) << result.mimeType;
     EXPECT_EQ(result.width, w);
     EXPECT_EQ(result.height, h);
@@ -63,7 +63,7 @@ TEST(MalformedInputTest, HeaderProbeNeverTrustsDamagedHeaders) {
   for (int round = 0; round < 1000; ++round) {
     const std::string* base[] = {&png, &gif, &bmp, &wbmp, &jpeg};
     std::string bytes = mutate(*base[round % 5], rng, 48);
-    ASSERT_TRUE(writeBytes(dir.file("damaged"), bytes));
+    ASSERT_TRUE(writeFileBytes(dir.file("damaged"), bytes));
     platform_image::ProbeResult damaged;
     if (platform_image::probe(dir.file("damaged").c_str(), damaged)) {
       ++accepted;
@@ -88,11 +88,11 @@ TEST(MalformedInputTest, ThemeTablesSurviveDamage) {
   std::mt19937 rng(7);
   for (int round = 0; round < 400; ++round) {
     std::string bytes = mutate(table, rng, table.size());
-    ASSERT_TRUE(writeBytes(dir.file("colors.xml"), bytes));
+    ASSERT_TRUE(writeFileBytes(dir.file("colors.xml"), bytes));
     if (Uxt_Theme_Color_Table* parsed = uxt_theme_add_color_table(dir.file("colors.xml").c_str())) {
       uxt_theme_delete_color_table(parsed);
     }
-    ASSERT_TRUE(writeBytes(dir.file("fonts.xml"), bytes));
+    ASSERT_TRUE(writeFileBytes(dir.file("fonts.xml"), bytes));
     if (Uxt_Theme_Font_Table* parsed = uxt_theme_add_font_table(dir.file("fonts.xml").c_str())) {
       uxt_theme_delete_font_table(parsed);
     }

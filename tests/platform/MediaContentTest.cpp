@@ -14,7 +14,7 @@
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::TempDir;
-using pictavo::test::writeBytes;
+using pictavo::test::writeFileBytes;
 using pictavo::test::writeTestPng;
 
 namespace {
@@ -91,13 +91,13 @@ TEST_F(MediaContentTest, RefusesWhatIsNotAnImageFile) {
   EXPECT_NE(media_content_scan_file(mDir.file("missing.jpg").c_str()), MEDIA_CONTENT_ERROR_NONE);
   EXPECT_NE(media_content_scan_file(mDir.path().c_str()), MEDIA_CONTENT_ERROR_NONE);
   EXPECT_NE(media_content_scan_file(nullptr), MEDIA_CONTENT_ERROR_NONE);
-  ASSERT_TRUE(writeBytes(mDir.file("notes.jpg"), "plain text, not a picture"));
+  ASSERT_TRUE(writeFileBytes(mDir.file("notes.jpg"), "plain text, not a picture"));
   EXPECT_NE(media_content_scan_file(mDir.file("notes.jpg").c_str()), MEDIA_CONTENT_ERROR_NONE);
   // A PNG cut short before its header ends.
-  ASSERT_TRUE(writeBytes(mDir.file("cut.png"), std::string("\x89PNG\r\n\x1a\n\0\0\0\rIH", 14)));
+  ASSERT_TRUE(writeFileBytes(mDir.file("cut.png"), std::string("\x89PNG\r\n\x1a\n\0\0\0\rIH", 14)));
   EXPECT_NE(media_content_scan_file(mDir.file("cut.png").c_str()), MEDIA_CONTENT_ERROR_NONE);
   // A JPEG whose segments run past the end of the file.
-  ASSERT_TRUE(writeBytes(mDir.file("cut.jpg"), std::string("\xFF\xD8\xFF\xE0\x7F\xFF", 6)));
+  ASSERT_TRUE(writeFileBytes(mDir.file("cut.jpg"), std::string("\xFF\xD8\xFF\xE0\x7F\xFF", 6)));
   EXPECT_NE(media_content_scan_file(mDir.file("cut.jpg").c_str()), MEDIA_CONTENT_ERROR_NONE);
   EXPECT_EQ(media_content_disconnect(), MEDIA_CONTENT_ERROR_NONE);
 

@@ -9,6 +9,7 @@
 #include "ShellTestFiles.h"
 #include "common/CLyUtil.h"
 #include "platform/app_control_launch_private.h"
+#include "tests/support/AppControlReplies.h"
 #include "tests/support/TestSupport.h"
 
 using pictavo::test::LogCapture;
@@ -18,27 +19,11 @@ using pictavo::test::TempDir;
 
 namespace {
 
-struct Replies {
-  int count = 0;
-  app_control_result_e result = APP_CONTROL_RESULT_APP_STARTED;
-  std::vector<std::string> selected;
+// The shell reads the selection under the key's short form.
+struct Replies : pictavo::test::AppControlReplies {
+  Replies() { selectedKey = "appcontrol/data/selected"; }
 };
-
-void onReply(app_control_h, app_control_h reply, app_control_result_e result, void* data) {
-  auto* replies = static_cast<Replies*>(data);
-  ++replies->count;
-  replies->result = result;
-  char** values = nullptr;
-  int length = 0;
-  if (app_control_get_extra_data_array(reply, "appcontrol/data/selected", &values, &length) ==
-      APP_CONTROL_ERROR_NONE) {
-    for (int i = 0; i < length; ++i) {
-      if (values[i]) replies->selected.emplace_back(values[i]);
-      free(values[i]);
-    }
-    free(values);
-  }
-}
+constexpr auto onReply = &Replies::onReply;
 
 class CLyAppControlLauncherTest : public ::testing::Test {
  protected:

@@ -2,29 +2,14 @@
 
 #include <jpeglib.h>
 #include <libexif/exif-data.h>
-#include <sys/stat.h>
 
 #include <cstdio>
 #include <cstdlib>
-#include <fstream>
 #include <vector>
 
 namespace pictavo::test {
 
 namespace {
-
-// elementary keeps its run folder under $HOME, which may not exist yet in a
-// fresh build tree.
-const bool gHomeReady = [] {
-  const char* home = getenv("HOME");
-  if (!home || !*home) return false;
-  std::string path;
-  for (const char* p = home; *p; ++p) {
-    path += *p;
-    if (p[1] == '/' || p[1] == '\0') mkdir(path.c_str(), 0755);
-  }
-  return true;
-}();
 
 std::vector<unsigned char> exifBytes(ExifPlace place, uint16_t orientation, bool bigEndian) {
   std::vector<unsigned char> bytes;
@@ -83,12 +68,6 @@ bool writeJpegWithRawApp1(const std::string& path, const std::string& junk) {
   std::vector<unsigned char> app1 = {'E', 'x', 'i', 'f', 0, 0};
   app1.insert(app1.end(), junk.begin(), junk.end());
   return writeJpegWithApp1(path, app1);
-}
-
-bool writeFileBytes(const std::string& path, const std::string& bytes) {
-  std::ofstream out(path, std::ios::binary);
-  out << bytes;
-  return static_cast<bool>(out);
 }
 
 ScopedEnv::ScopedEnv(const char* name, const char* value) : mName(name) {

@@ -4,6 +4,8 @@
 #include <cstdint>
 #include <string>
 
+#include "tests/support/TestSupport.h"
+
 namespace pictavo::test {
 
 enum class ExifPlace { NONE, IFD0, IFD1_ONLY };
@@ -14,7 +16,6 @@ bool writeJpeg(const std::string& path, ExifPlace place = ExifPlace::NONE, uint1
                bool bigEndian = false);
 // A JPEG whose APP1 segment says "Exif" but holds `junk`.
 bool writeJpegWithRawApp1(const std::string& path, const std::string& junk);
-bool writeFileBytes(const std::string& path, const std::string& bytes);
 
 // Sets an environment variable for a scope and restores it afterwards
 // (nullptr unsets it).

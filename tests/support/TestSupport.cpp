@@ -3,11 +3,13 @@
 #include <Ecore.h>
 #include <Elementary.h>
 #include <ftw.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
+#include <fstream>
 #include <system_error>
 
 #include "common/CLyLog.h"
@@ -51,6 +53,23 @@ std::vector<std::string> LogCapture::lines() const {
 void LogCapture::clear() {
   std::lock_guard<std::mutex> lock(mMutex);
   mLines.clear();
+}
+
+bool ensureHomeFolder() {
+  const char* home = getenv("HOME");
+  if (!home || !*home) return false;
+  std::string path;
+  for (const char* p = home; *p; ++p) {
+    path += *p;
+    if (p[1] == '/' || p[1] == '\0') mkdir(path.c_str(), 0755);
+  }
+  return true;
+}
+
+bool writeFileBytes(const std::string& path, const std::string& bytes) {
+  std::ofstream out(path, std::ios::binary);
+  out << bytes;
+  return static_cast<bool>(out);
 }
 
 namespace {

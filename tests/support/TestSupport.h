@@ -34,6 +34,14 @@ class LogCapture {
   std::vector<std::string> mLines;
 };
 
+// Creates $HOME with its parents: elementary keeps its run folder there, and
+// the private home of a test run may not exist yet on a fresh build tree.
+// The shared main calls it before any test.
+bool ensureHomeFolder();
+
+// Writes `bytes` as the whole file at `path`.
+bool writeFileBytes(const std::string& path, const std::string& bytes);
+
 // elm_init once for the program, on the buffer engine (ELM_ENGINE=buffer).
 void ensureElm();
 void shutdownElm();
