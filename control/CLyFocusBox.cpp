@@ -9,6 +9,7 @@
 #include <new>
 #include <string>
 
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyCairoCanvas.h"
 #include "common/CLyLog.h"
 #include "common/CLyUtil.h"
@@ -113,7 +114,7 @@ namespace {
 
 // Objects of the box die with their smart parent; forget them then, so the
 // destructor never deletes twice.
-void onOwnedObjectDel(void* data, Evas*, Evas_Object* obj, void*) {
+void onOwnedObjectDel(void* data, Evas_Object* obj) {
   auto* impl = static_cast<_CLyFocusBoxImpl*>(data);
   if (obj == impl->image) {
     delete impl->canvas;  // its surface wraps the object's pixels
@@ -130,7 +131,7 @@ void unwatchAndDelete(_CLyFocusBoxImpl* impl, Evas_Object*& obj);
 
 // Foreign smart members outlive a deleted smart parent (evas only lets go of
 // them), so the box removes its objects itself when its parent goes.
-void onParentDel(void* data, Evas*, Evas_Object*, void*) {
+void onParentDel(void* data, Evas_Object*) {
   auto* impl = static_cast<_CLyFocusBoxImpl*>(data);
   impl->dragging = false;
   for (int i = 0; i < CLyFocusBox::kGripCount; ++i) {
@@ -145,12 +146,12 @@ void onParentDel(void* data, Evas*, Evas_Object*, void*) {
 }
 
 void watch(_CLyFocusBoxImpl* impl, Evas_Object* obj) {
-  evas_object_event_callback_add(obj, EVAS_CALLBACK_DEL, onOwnedObjectDel, impl);
+  app_assist::wevasobject_add_deletion_hook(obj, onOwnedObjectDel, impl);
 }
 
 void unwatchAndDelete(_CLyFocusBoxImpl* impl, Evas_Object*& obj) {
   if (!obj) return;
-  evas_object_event_callback_del_full(obj, EVAS_CALLBACK_DEL, onOwnedObjectDel, impl);
+  app_assist::wevasobject_remove_deletion_hook(obj, onOwnedObjectDel, impl);
   evas_object_del(obj);
   obj = nullptr;
 }
@@ -163,8 +164,7 @@ CLyFocusBox::CLyFocusBox() : _pImpl(new (std::nothrow) _CLyFocusBoxImpl) {
 
 CLyFocusBox::~CLyFocusBox() {
   if (!_pImpl) return;
-  if (_pImpl->parent)
-    evas_object_event_callback_del_full(_pImpl->parent, EVAS_CALLBACK_DEL, onParentDel, _pImpl);
+  if (_pImpl->parent) app_assist::wevasobject_remove_deletion_hook(_pImpl->parent, onParentDel, _pImpl);
   for (int i = 0; i < kGripCount; ++i) {
     unwatchAndDelete(_pImpl, _pImpl->grips[i]);
     unwatchAndDelete(_pImpl, _pImpl->icons[i]);
@@ -228,7 +228,7 @@ bool CLyFocusBox::create(Evas_Object* parent, Evas_Object* swallow) {
   }
   _pImpl->image = image;
   watch(_pImpl, image);
-  evas_object_event_callback_add(parent, EVAS_CALLBACK_DEL, onParentDel, _pImpl);
+  app_assist::wevasobject_add_deletion_hook(parent, onParentDel, _pImpl);
   evas_object_pass_events_set(image, EINA_TRUE);
   if (smartParent) evas_object_smart_member_add(image, smartParent);
   evas_object_show(image);

@@ -4,6 +4,7 @@
 
 #include <new>
 
+#include "app-assist/WDeletionHook.h"
 #include "common/CLyLog.h"
 
 namespace {
@@ -88,7 +89,7 @@ struct _CLyGestureImpl {
     info.timestamp = e->timestamp;
     static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MULTI_MOVE, LY_GESTURE_STATE_START, info);
   }
-  static void onTargetDel(void* data, Evas*, Evas_Object*, void*) {
+  static void onTargetDel(void* data, Evas_Object*) {
     auto* impl = static_cast<_CLyGestureImpl*>(data);
     impl->owner->__detach();
     impl->target = nullptr;
@@ -149,8 +150,7 @@ CLyGesture::~CLyGesture() {
   if (!_pImpl) return;
   __detach();
   if (_pImpl->target)
-    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel,
-                                        _pImpl);
+    app_assist::wevasobject_remove_deletion_hook(_pImpl->target, _CLyGestureImpl::onTargetDel, _pImpl);
   delete _pImpl;
 }
 
@@ -162,11 +162,10 @@ void CLyGesture::setTarget(Evas_Object* target) {
   if (!_pImpl || target == _pImpl->target) return;
   __detach();
   if (_pImpl->target)
-    evas_object_event_callback_del_full(_pImpl->target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel,
-                                        _pImpl);
+    app_assist::wevasobject_remove_deletion_hook(_pImpl->target, _CLyGestureImpl::onTargetDel, _pImpl);
   _pImpl->target = target;
   if (target) {
-    evas_object_event_callback_add(target, EVAS_CALLBACK_DEL, _CLyGestureImpl::onTargetDel, _pImpl);
+    app_assist::wevasobject_add_deletion_hook(target, _CLyGestureImpl::onTargetDel, _pImpl);
     __attach();
   }
 }

@@ -210,6 +210,19 @@ TEST_F(FocusBoxTest, ParentDeletedBeforeTheBox) {
   box.reset();
 }
 
+TEST_F(FocusBoxTest, ParentDeletedWhileItsEventsAreFrozen) {
+  // Evas holds back deletion callbacks of frozen objects; the box must still
+  // let go of its objects, or it would delete them a second time later.
+  evas_object_freeze_events_set(parent, EINA_TRUE);
+  evas_object_freeze_events_set(box->getImageObject(), EINA_TRUE);
+  evas_object_del(parent);
+  parent = nullptr;
+  EXPECT_EQ(nullptr, box->getImageObject());
+  EXPECT_EQ(nullptr, box->getGrip(0));
+  box->show(CLyFloatRectangle(0, 0, 10, 10), 0);
+  box.reset();
+}
+
 TEST(FocusBoxCreate, NullParentIsRefused) {
   LogCapture log;
   CLyFocusBox box;
