@@ -36,21 +36,28 @@ struct _CLyGestureImpl {
   }
 
   // ---- raw events of the target ----
-  static void onMouseDown(void* data, Evas*, Evas_Object*, void* ev) {
-    auto* e = static_cast<Evas_Event_Mouse_Down*>(ev);
-    CLyGestureInfo info;
-    info.x = info.startX = e->canvas.x;
-    info.y = info.startY = e->canvas.y;
-    info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MOUSE_DOWN, LY_GESTURE_STATE_START, info);
+  // Presses and releases of either kind report where they happened; a mouse
+  // move also reports where it came from; multi-touch events name the finger.
+  static void point(CLyGestureInfo& info, const Evas_Coord_Point& at) {
+    info.x = info.startX = at.x;
+    info.y = info.startY = at.y;
   }
-  static void onMouseUp(void* data, Evas*, Evas_Object*, void* ev) {
-    auto* e = static_cast<Evas_Event_Mouse_Up*>(ev);
-    CLyGestureInfo info;
-    info.x = info.startX = e->canvas.x;
-    info.y = info.startY = e->canvas.y;
+  template <typename Event>
+  static void finger(CLyGestureInfo& info, const Event* e) {
+    info.device = e->device;
     info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MOUSE_UP, LY_GESTURE_STATE_START, info);
+  }
+  static void emit(void* data, int type, CLyGestureInfo& info) {
+    static_cast<_CLyGestureImpl*>(data)->owner->__emit(type, LY_GESTURE_STATE_START, info);
+  }
+
+  template <typename Event, int Type>
+  static void onMouseButton(void* data, Evas*, Evas_Object*, void* ev) {
+    auto* e = static_cast<Event*>(ev);
+    CLyGestureInfo info;
+    point(info, e->canvas);
+    info.timestamp = e->timestamp;
+    emit(data, Type, info);
   }
   static void onMouseMove(void* data, Evas*, Evas_Object*, void* ev) {
     auto* e = static_cast<Evas_Event_Mouse_Move*>(ev);
@@ -60,34 +67,28 @@ struct _CLyGestureImpl {
     info.startX = e->prev.canvas.x;
     info.startY = e->prev.canvas.y;
     info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MOUSE_MOVE, LY_GESTURE_STATE_START, info);
+    emit(data, LY_GESTURE_MOUSE_MOVE, info);
   }
-  static void onMultiDown(void* data, Evas*, Evas_Object*, void* ev) {
-    auto* e = static_cast<Evas_Event_Multi_Down*>(ev);
+  template <typename Event, int Type>
+  static void onMultiButton(void* data, Evas*, Evas_Object*, void* ev) {
+    auto* e = static_cast<Event*>(ev);
     CLyGestureInfo info;
-    info.x = info.startX = e->canvas.x;
-    info.y = info.startY = e->canvas.y;
-    info.device = e->device;
-    info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MULTI_DOWN, LY_GESTURE_STATE_START, info);
+    point(info, Evas_Coord_Point{e->canvas.x, e->canvas.y});
+    finger(info, e);
+    emit(data, Type, info);
   }
-  static void onMultiUp(void* data, Evas*, Evas_Object*, void* ev) {
-    auto* e = static_cast<Evas_Event_Multi_Up*>(ev);
-    CLyGestureInfo info;
-    info.x = info.startX = e->canvas.x;
-    info.y = info.startY = e->canvas.y;
-    info.device = e->device;
-    info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MULTI_UP, LY_GESTURE_STATE_START, info);
-  }
+  static constexpr Evas_Object_Event_Cb onMouseDown =
+      onMouseButton<Evas_Event_Mouse_Down, LY_GESTURE_MOUSE_DOWN>;
+  static constexpr Evas_Object_Event_Cb onMouseUp = onMouseButton<Evas_Event_Mouse_Up, LY_GESTURE_MOUSE_UP>;
+  static constexpr Evas_Object_Event_Cb onMultiDown =
+      onMultiButton<Evas_Event_Multi_Down, LY_GESTURE_MULTI_DOWN>;
+  static constexpr Evas_Object_Event_Cb onMultiUp = onMultiButton<Evas_Event_Multi_Up, LY_GESTURE_MULTI_UP>;
   static void onMultiMove(void* data, Evas*, Evas_Object*, void* ev) {
     auto* e = static_cast<Evas_Event_Multi_Move*>(ev);
     CLyGestureInfo info;
-    info.x = info.startX = e->cur.canvas.x;
-    info.y = info.startY = e->cur.canvas.y;
-    info.device = e->device;
-    info.timestamp = e->timestamp;
-    static_cast<_CLyGestureImpl*>(data)->owner->__emit(LY_GESTURE_MULTI_MOVE, LY_GESTURE_STATE_START, info);
+    point(info, Evas_Coord_Point{e->cur.canvas.x, e->cur.canvas.y});
+    finger(info, e);
+    emit(data, LY_GESTURE_MULTI_MOVE, info);
   }
   static void onTargetDel(void* data, Evas_Object*) {
     auto* impl = static_cast<_CLyGestureImpl*>(data);

@@ -25,6 +25,7 @@
 class Bitmap;
 class CLyEvent;
 class CLyFocusBox;
+class CLyGridImageInfo;
 class CLyMultiGridDrawRectList;
 class CLyMultiGridSrcItemList;
 struct _CLyMultiGridImpl;
@@ -185,6 +186,7 @@ class CLyMultiGrid : public CLyControl {
   void __onTap(int type, int state, int x, int y);
   void __tryClickHover(int x, int y, int pressed, int touched);
   void __notifyMainView();
+  CLyGridImageInfo* __currentImageInfo() const;
   void __showFocusHandler();
   void __resizeFocusRect(const CLyPoint& delta, int dotIndex);
   void __endHandlerDrag();

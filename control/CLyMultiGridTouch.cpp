@@ -501,21 +501,26 @@ void CLyMultiGrid::__destroyFocusRect() {
   _pImpl->previousIndex = -1;
 }
 
-void CLyMultiGrid::__showFocusHandler() {
+// The layout cell of the selected photo, with its handlers; logged when missing.
+CLyGridImageInfo* CLyMultiGrid::__currentImageInfo() const {
   CLyMultiGridDrawRectList* list = _pImpl->drawRectList;
-  if (!list || !_pImpl->focusBox) return;
-  const int current = _pImpl->currentIndex;
   CLyGridImageLayoutInfo* layout =
       CLyMultiGridStyleManager::getInstance().getGridImageLayout(list->getCount(), list->getStyleIndex());
   if (!layout) {
     LYLOG_E("Invalid gridLayoutInfo");
-    return;
+    return nullptr;
   }
-  CLyGridImageInfo* info = layout->getImageInfo(current);
-  if (!info) {
-    LYLOG_E("Invalid imageInfo");
-    return;
-  }
+  CLyGridImageInfo* info = layout->getImageInfo(_pImpl->currentIndex);
+  if (!info) LYLOG_E("Invalid imageInfo");
+  return info;
+}
+
+void CLyMultiGrid::__showFocusHandler() {
+  CLyMultiGridDrawRectList* list = _pImpl->drawRectList;
+  if (!list || !_pImpl->focusBox) return;
+  const int current = _pImpl->currentIndex;
+  CLyGridImageInfo* info = __currentImageInfo();
+  if (!info) return;
   const int count = info->getHandlerCount();
   LYLOG_D("handler count: %d", count);
   const CLyFloatRectangle cell = list->get(current);
@@ -544,17 +549,8 @@ void CLyMultiGrid::__resizeFocusRect(const CLyPoint& delta, int dotIndex) {
     LYLOG_E("Invalid index[%d]", current);
     return;
   }
-  CLyGridImageLayoutInfo* layout =
-      CLyMultiGridStyleManager::getInstance().getGridImageLayout(list->getCount(), list->getStyleIndex());
-  if (!layout) {
-    LYLOG_E("Invalid gridLayoutInfo");
-    return;
-  }
-  CLyGridImageInfo* info = layout->getImageInfo(current);
-  if (!info) {
-    LYLOG_E("Invalid imageInfo");
-    return;
-  }
+  CLyGridImageInfo* info = __currentImageInfo();
+  if (!info) return;
   list->updateItem(current, info, dotIndex, delta);
   // A divider drag repaints every cell along the divider on each step: draw
   // them with the cheap filter while the finger moves, and once more
