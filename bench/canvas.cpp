@@ -13,6 +13,7 @@
 #include <vector>
 
 #include "app-assist/WWindowController.h"
+#include "bench/BenchTiming.h"
 #include "codec/BitmapFactory.h"
 #include "common/CLyCairoCanvas.h"
 #include "control/CLyMultiGrid.h"
@@ -26,19 +27,7 @@ namespace {
 
 using Clock = std::chrono::steady_clock;
 
-template <typename F>
-void measure(const char* name, int runs, F&& f) {
-  for (int i = 0; i < 3; i++) f(i);
-  std::vector<double> t;
-  for (int i = 0; i < runs; i++) {
-    auto t0 = Clock::now();
-    f(i);
-    t.push_back(std::chrono::duration<double, std::milli>(Clock::now() - t0).count());
-  }
-  std::sort(t.begin(), t.end());
-  printf("%s: %.3f %.3f %.3f (ms)\n", name, t.front(), t[t.size() / 2], t.back());
-  fflush(stdout);
-}
+using pictavo::bench::measure;
 
 // A photo-like bitmap: smooth gradients plus a little texture.
 Bitmap* photo(int w, int h, int seed) {

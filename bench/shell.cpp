@@ -30,6 +30,7 @@
 #include <string>
 #include <vector>
 
+#include "bench/BenchTiming.h"
 #include "common/CLyUtil.h"
 #include "misc/CLyLogManager.h"
 #include "platform/core/dlog.h"
@@ -38,19 +39,7 @@ namespace {
 
 using Clock = std::chrono::steady_clock;
 
-template <typename F>
-void measure(const char* name, int runs, F&& f) {
-  for (int i = 0; i < 3; i++) f(i);
-  std::vector<double> t;
-  for (int i = 0; i < runs; i++) {
-    auto t0 = Clock::now();
-    f(i);
-    t.push_back(std::chrono::duration<double, std::milli>(Clock::now() - t0).count());
-  }
-  std::sort(t.begin(), t.end());
-  printf("%s: %.3f %.3f %.3f (ms)\n", name, t.front(), t[t.size() / 2], t.back());
-  fflush(stdout);
-}
+using pictavo::bench::measure;
 
 // A photo-sized JPEG with EXIF orientation 6 in IFD 0.
 bool writePhoto(const std::string& path, int w, int h) {

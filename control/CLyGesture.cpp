@@ -200,42 +200,38 @@ Evas_Object* CLyGesture::onCreateView(Evas_Object* parent, void*) {
   if (_pImpl->longTapTimeout > 0) elm_gesture_layer_long_tap_start_timeout_set(layer, _pImpl->longTapTimeout);
 
   using I = _CLyGestureImpl;
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_START,
-                           I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_START>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_END,
-                           I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_END>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_ABORT,
-                           I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_ABORT>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_START,
-                           I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_START>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_MOVE,
-                           I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_MOVE>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_END,
-                           I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_END>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_ABORT,
-                           I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_ABORT>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_START,
-                           I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_START>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_END,
-                           I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_END>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_ABORT,
-                           I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_ABORT>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_START,
-                           I::onMomentum<ELM_GESTURE_STATE_START>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_MOVE,
-                           I::onMomentum<ELM_GESTURE_STATE_MOVE>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_END,
-                           I::onMomentum<ELM_GESTURE_STATE_END>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_ABORT,
-                           I::onMomentum<ELM_GESTURE_STATE_ABORT>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_START,
-                           I::onZoom<ELM_GESTURE_STATE_START>, _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_MOVE, I::onZoom<ELM_GESTURE_STATE_MOVE>,
-                           _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_END, I::onZoom<ELM_GESTURE_STATE_END>,
-                           _pImpl);
-  elm_gesture_layer_cb_set(layer, ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_ABORT,
-                           I::onZoom<ELM_GESTURE_STATE_ABORT>, _pImpl);
+  struct LayerCallback {
+    Elm_Gesture_Type type;
+    Elm_Gesture_State state;
+    Elm_Gesture_Event_Cb cb;
+  };
+  static const LayerCallback kCallbacks[] = {
+      {ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_START, I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_START>},
+      {ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_END, I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_END>},
+      {ELM_GESTURE_N_TAPS, ELM_GESTURE_STATE_ABORT, I::onTaps<LY_GESTURE_TAP, ELM_GESTURE_STATE_ABORT>},
+      {ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_START,
+       I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_START>},
+      {ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_MOVE,
+       I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_MOVE>},
+      {ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_END, I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_END>},
+      {ELM_GESTURE_N_LONG_TAPS, ELM_GESTURE_STATE_ABORT,
+       I::onTaps<LY_GESTURE_LONG_TAP, ELM_GESTURE_STATE_ABORT>},
+      {ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_START,
+       I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_START>},
+      {ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_END,
+       I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_END>},
+      {ELM_GESTURE_N_DOUBLE_TAPS, ELM_GESTURE_STATE_ABORT,
+       I::onTaps<LY_GESTURE_DOUBLE_TAP, ELM_GESTURE_STATE_ABORT>},
+      {ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_START, I::onMomentum<ELM_GESTURE_STATE_START>},
+      {ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_MOVE, I::onMomentum<ELM_GESTURE_STATE_MOVE>},
+      {ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_END, I::onMomentum<ELM_GESTURE_STATE_END>},
+      {ELM_GESTURE_MOMENTUM, ELM_GESTURE_STATE_ABORT, I::onMomentum<ELM_GESTURE_STATE_ABORT>},
+      {ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_START, I::onZoom<ELM_GESTURE_STATE_START>},
+      {ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_MOVE, I::onZoom<ELM_GESTURE_STATE_MOVE>},
+      {ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_END, I::onZoom<ELM_GESTURE_STATE_END>},
+      {ELM_GESTURE_ZOOM, ELM_GESTURE_STATE_ABORT, I::onZoom<ELM_GESTURE_STATE_ABORT>},
+  };
+  for (const LayerCallback& c : kCallbacks) elm_gesture_layer_cb_set(layer, c.type, c.state, c.cb, _pImpl);
   __attach();
   return layer;
 }
@@ -246,17 +242,28 @@ void CLyGesture::onDestroy() {
   _pImpl->layer = nullptr;
 }
 
+namespace {
+struct RawCallback {
+  Evas_Callback_Type type;
+  Evas_Callback_Priority priority;
+  Evas_Object_Event_Cb cb;
+};
+const RawCallback kRawCallbacks[] = {
+    {EVAS_CALLBACK_MOUSE_DOWN, kBeforeLayer, _CLyGestureImpl::onMouseDown},
+    {EVAS_CALLBACK_MOUSE_MOVE, kBeforeLayer, _CLyGestureImpl::onMouseMove},
+    {EVAS_CALLBACK_MULTI_DOWN, kBeforeLayer, _CLyGestureImpl::onMultiDown},
+    {EVAS_CALLBACK_MULTI_MOVE, kBeforeLayer, _CLyGestureImpl::onMultiMove},
+    {EVAS_CALLBACK_MOUSE_UP, kAfterLayer, _CLyGestureImpl::onMouseUp},
+    {EVAS_CALLBACK_MULTI_UP, kAfterLayer, _CLyGestureImpl::onMultiUp},
+};
+}  // namespace
+
 void CLyGesture::__attach() {
   if (!_pImpl || _pImpl->attached || !_pImpl->layer || !_pImpl->target) return;
   Evas_Object* t = _pImpl->target;
-  using I = _CLyGestureImpl;
   // Presses and moves first, releases last: see the header.
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_DOWN, kBeforeLayer, I::onMouseDown, _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_MOVE, kBeforeLayer, I::onMouseMove, _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_DOWN, kBeforeLayer, I::onMultiDown, _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_MOVE, kBeforeLayer, I::onMultiMove, _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MOUSE_UP, kAfterLayer, I::onMouseUp, _pImpl);
-  evas_object_event_callback_priority_add(t, EVAS_CALLBACK_MULTI_UP, kAfterLayer, I::onMultiUp, _pImpl);
+  for (const RawCallback& c : kRawCallbacks)
+    evas_object_event_callback_priority_add(t, c.type, c.priority, c.cb, _pImpl);
   elm_gesture_layer_attach(_pImpl->layer, t);
   _pImpl->attached = true;
 }
@@ -266,13 +273,7 @@ void CLyGesture::__detach() {
   _pImpl->attached = false;
   Evas_Object* t = _pImpl->target;
   if (!t) return;
-  using I = _CLyGestureImpl;
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MOUSE_DOWN, I::onMouseDown, _pImpl);
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MOUSE_MOVE, I::onMouseMove, _pImpl);
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MULTI_DOWN, I::onMultiDown, _pImpl);
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MULTI_MOVE, I::onMultiMove, _pImpl);
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MOUSE_UP, I::onMouseUp, _pImpl);
-  evas_object_event_callback_del_full(t, EVAS_CALLBACK_MULTI_UP, I::onMultiUp, _pImpl);
+  for (const RawCallback& c : kRawCallbacks) evas_object_event_callback_del_full(t, c.type, c.cb, _pImpl);
 }
 
 void CLyGesture::__emit(int type, int state, CLyGestureInfo& info) {
