@@ -36,7 +36,7 @@ void lookSoftGlow(const Frame& f);
 void lookNostalgia(const Frame& f);
 void lookSunshine(const Frame& f);
 
-// Detail and drawing looks (filter_detail.cpp).
+// Detail and drawing looks (filter_sharpen.cpp, filter_cartoon.cpp).
 void lookSharpen(const Frame& f);
 void lookCartoon(const Frame& f);
 

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
+
+#include "platform/image-filter/filter_simd.h"
 
 #if defined(__x86_64__)
 #include <immintrin.h>
@@ -31,6 +34,13 @@ int sizeForBlocks(const Frame& f, int factor, Image& out) {
   out.resize(sw, sh);
   return sw;
 }
+
+// floor(x / n) by one multiply, exact for x < 2^24 and 0 < n < 2^16.
+struct Divider {
+  uint64_t m;
+  explicit Divider(uint32_t n) : m(((1ull << 40) + n - 1) / n) {}
+  uint32_t operator()(uint32_t x) const { return (uint32_t)(((uint64_t)x * m) >> 40); }
+};
 
 // fn(by, y0, y1) for each band of `factor` source rows.
 template <typename Fn>
@@ -63,36 +73,37 @@ void downscale(const Frame& f, int factor, Rgba& out) {
       return;
     }
     if (factor <= 16) {
-      // Even and odd bytes of whole pixels are summed in 16-bit lanes; a
-      // block of at most 16 x 16 pixels cannot overflow them.
-      std::vector<uint32_t> even((size_t)sw), odd((size_t)sw);
+      // Column sums of a band in 16-bit lanes (the loop vectorises), then a
+      // block's four channel sums in one 64-bit word: a block of at most
+      // 16 x 16 pixels cannot overflow a lane.
+      const size_t n = (size_t)f.width * 4;
+      std::vector<uint16_t> cols(n);
       forEachBand(f, factor, [&](int by, int y0, int y1) {
-        std::fill(even.begin(), even.end(), 0u);
-        std::fill(odd.begin(), odd.end(), 0u);
+        std::fill(cols.begin(), cols.end(), (uint16_t)0);
         for (int y = y0; y < y1; ++y) {
           const uint8_t* s = f.srcRow(y);
-          for (int bx = 0; bx < sw; ++bx) {
-            const int x1 = std::min(f.width, (bx + 1) * factor);
-            uint32_t e = 0, o = 0;
-            for (int x = bx * factor; x < x1; ++x) {
-              const uint32_t p = load32(s + (size_t)x * 4);
-              e += p & 0x00ff00ffu;
-              o += (p >> 8) & 0x00ff00ffu;
-            }
-            even[(size_t)bx] += e;
-            odd[(size_t)bx] += o;
-          }
+          for (size_t k = 0; k < n; ++k) cols[k] = (uint16_t)(cols[k] + s[k]);
         }
         uint8_t* d = out.row(by);
         const int rows = y1 - y0;
+        const Divider inner((uint32_t)(rows * factor));
         for (int bx = 0; bx < sw; ++bx) {
-          const uint32_t n = blockArea(f, factor, bx, rows);
-          const uint32_t e = even[(size_t)bx], o = odd[(size_t)bx];
-          const uint32_t byteSum[4] = {e & 0xffffu, o & 0xffffu, e >> 16, o >> 16};
-          d[bx * 4 + 0] = (uint8_t)((byteSum[c.r] + n / 2) / n);
-          d[bx * 4 + 1] = (uint8_t)((byteSum[c.g] + n / 2) / n);
-          d[bx * 4 + 2] = (uint8_t)((byteSum[c.b] + n / 2) / n);
-          d[bx * 4 + 3] = (uint8_t)((byteSum[c.a] + n / 2) / n);
+          const int x1 = std::min(f.width, (bx + 1) * factor);
+          uint64_t sum = 0;
+          for (int x = bx * factor; x < x1; ++x) {
+            uint64_t v;
+            std::memcpy(&v, &cols[(size_t)x * 4], 8);
+            sum += v;
+          }
+          const uint32_t area = blockArea(f, factor, bx, rows);
+          const Divider div = x1 - bx * factor == factor ? inner : Divider(area);
+          auto average = [&](int byteIndex) {
+            return (uint8_t)div((uint32_t)(sum >> (16 * byteIndex)) % 65536u + area / 2);
+          };
+          d[bx * 4 + 0] = average(c.r);
+          d[bx * 4 + 1] = average(c.g);
+          d[bx * 4 + 2] = average(c.b);
+          d[bx * 4 + 3] = average(c.a);
         }
       });
       return;
@@ -129,92 +140,108 @@ void downscale(const Frame& f, int factor, Rgba& out) {
   });
 }
 
-void downscaleLuma(const Frame& f, int factor, Gray& out) {
-  const int sw = sizeForBlocks(f, factor, out);
+namespace {
+
+#if defined(__x86_64__)
+// Sixteen 32-bit values 0..255 (two vectors of eight) stored as sixteen bytes.
+__attribute__((target("avx2"))) inline void storeBytes16(uint8_t* out, __m256i lo, __m256i hi) {
+  const __m256i p16 = _mm256_permute4x64_epi64(_mm256_packus_epi32(lo, hi), 0xD8);
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(out),
+                   _mm_packus_epi16(_mm256_castsi256_si128(p16), _mm256_extracti128_si256(p16, 1)));
+}
+
+template <int SR, int SG, int SB>
+__attribute__((target("avx2"))) int lumaRowAvx2(const uint8_t* s, uint8_t* out, int w) {
+  using namespace simd;
+  int x = 0;
+  for (; x + 16 <= w; x += 16) {
+    const __m256i p0 = load8(s + (size_t)x * 4), p1 = load8(s + (size_t)x * 4 + 32);
+    storeBytes16(out + x, luma(channel<SR>(p0), channel<SG>(p0), channel<SB>(p0)),
+                 luma(channel<SR>(p1), channel<SG>(p1), channel<SB>(p1)));
+  }
+  return x;
+}
+
+// Window sums are exact, so direct sums give the same integers as the
+// running sums of the plain loop.
+__attribute__((target("avx2"))) int boxRowAvx2(const uint8_t* line, uint8_t* out, int count, int radius,
+                                               int step, uint32_t inv) {
+  const __m256i vinv = _mm256_set1_epi32((int)inv), half = _mm256_set1_epi32(1 << 23);
+  int i = 0;
+  for (; i + 16 <= count; i += 16) {
+    __m256i sum = _mm256_setzero_si256();
+    for (int k = 0; k <= 2 * radius; ++k)
+      sum = _mm256_add_epi16(
+          sum, _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(line + i + k * step))));
+    const __m256i lo = _mm256_cvtepu16_epi32(_mm256_castsi256_si128(sum));
+    const __m256i hi = _mm256_cvtepu16_epi32(_mm256_extracti128_si256(sum, 1));
+    storeBytes16(out + i, _mm256_srli_epi32(_mm256_add_epi32(_mm256_mullo_epi32(lo, vinv), half), 24),
+                 _mm256_srli_epi32(_mm256_add_epi32(_mm256_mullo_epi32(hi, vinv), half), 24));
+  }
+  return i;
+}
+#endif
+
+}  // namespace
+
+void lumaRow(const Frame& f, int y, uint8_t* out) {
   dispatchOrder(f.ch, [&](auto order) {
     constexpr Channels c = decltype(order)::ch;
-    if (factor == 1) {
-      for (int y = 0; y < f.height; ++y) {
-        const uint8_t* s = f.srcRow(y);
-        uint8_t* d = out.row(y);
-        for (int x = 0; x < f.width; ++x, s += 4) d[x] = (uint8_t)luma709(s[c.r], s[c.g], s[c.b]);
-      }
-      return;
-    }
-    std::vector<uint32_t> acc((size_t)sw);
-    forEachBand(f, factor, [&](int by, int y0, int y1) {
-      std::fill(acc.begin(), acc.end(), 0u);
-      for (int y = y0; y < y1; ++y) {
-        const uint8_t* s = f.srcRow(y);
-        for (int x = 0; x < f.width; ++x, s += 4)
-          acc[(size_t)(x / factor)] += (uint32_t)luma709(s[c.r], s[c.g], s[c.b]);
-      }
-      uint8_t* d = out.row(by);
-      const int rows = y1 - y0;
-      for (int bx = 0; bx < sw; ++bx) {
-        const uint32_t n = blockArea(f, factor, bx, rows);
-        d[bx] = (uint8_t)((acc[(size_t)bx] + n / 2) / n);
-      }
-    });
+    const uint8_t* s = f.srcRow(y);
+    int x = 0;
+#if defined(__x86_64__)
+    if (simdAvx2()) x = lumaRowAvx2<8 * c.r, 8 * c.g, 8 * c.b>(s, out, f.width);
+#endif
+    for (; x < f.width; ++x) out[x] = (uint8_t)luma709(s[x * 4 + c.r], s[x * 4 + c.g], s[x * 4 + c.b]);
   });
+}
+
+uint32_t boxInverse(int radius) {
+  return (1u << 24) / (uint32_t)(2 * radius + 1);
+}
+
+void boxRow(const uint8_t* line, uint8_t* out, int count, int radius, int step) {
+  const uint32_t inv = boxInverse(radius);
+  auto rounded = [inv](uint32_t sum) { return (uint8_t)((sum * inv + (1u << 23)) >> 24); };
+  int i = 0;
+#if defined(__x86_64__)
+  // A direct sum per output beats the running sum in vectors while the
+  // window is short.
+  if (radius <= 8 && simdAvx2()) i = boxRowAvx2(line, out, count, radius, step, inv);
+#endif
+  if (i > 0) {
+    for (; i < count; ++i) {
+      uint32_t sum = 0;
+      for (int k = 0; k <= 2 * radius; ++k) sum += line[i + k * step];
+      out[i] = rounded(sum);
+    }
+    return;
+  }
+  const int span = (2 * radius + 1) * step;
+  for (int c = 0; c < step; ++c) {
+    uint32_t sum = 0;
+    for (int k = c; k < span; k += step) sum += line[k];
+    for (int j = c; j < count; j += step) {
+      out[j] = rounded(sum);
+      sum += (uint32_t)line[j + span] - (uint32_t)line[j];
+    }
+  }
 }
 
 namespace {
 
-#if defined(__x86_64__)
-// The running sum of one row of four-channel pixels, the four sums in one
-// vector; the same integers as the plain loop.
-__attribute__((target("avx2"))) void rowRun4(const uint8_t* add, const uint8_t* sub, uint8_t* out, int w,
-                                             const uint32_t* start, uint32_t inv) {
-  const __m128i vinv = _mm_set1_epi32((int)inv), half = _mm_set1_epi32(1 << 23);
-  __m128i sum = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start));
-  for (int x = 0; x < w; ++x) {
-    __m128i o = _mm_srli_epi32(_mm_add_epi32(_mm_mullo_epi32(sum, vinv), half), 24);
-    o = _mm_packus_epi16(_mm_packus_epi32(o, o), o);
-    store32(out + (size_t)x * 4, (uint32_t)_mm_cvtsi128_si32(o));
-    const __m128i a = _mm_cvtepu8_epi32(_mm_cvtsi32_si128((int)load32(add + (size_t)x * 4)));
-    const __m128i b = _mm_cvtepu8_epi32(_mm_cvtsi32_si128((int)load32(sub + (size_t)x * 4)));
-    sum = _mm_sub_epi32(_mm_add_epi32(sum, a), b);
-  }
-}
-#endif
-
 template <int N>
 void blurRows(Image<N>& img, int r) {
   const int w = img.w;
-  const uint32_t inv = (1u << 24) / (uint32_t)(2 * r + 1);
   std::vector<uint8_t> line((size_t)(w + 2 * r + 1) * N);
-#if defined(__x86_64__)
-  const bool avx2 = simdAvx2();
-#endif
   for (int y = 0; y < img.h; ++y) {
     uint8_t* row = img.row(y);
     // Edge pixels repeat beyond both ends.
-    for (int i = 0; i < w + 2 * r + 1; ++i) {
-      const int x = std::clamp(i - r, 0, w - 1);
-      for (int k = 0; k < N; ++k) line[(size_t)i * N + k] = row[(size_t)x * N + k];
-    }
-    uint32_t sum[N] = {};
-    for (int i = 0; i < 2 * r + 1; ++i)
-      for (int k = 0; k < N; ++k) sum[k] += line[(size_t)i * N + k];
-    const uint8_t* add = line.data() + (size_t)(2 * r + 1) * N;
-    const uint8_t* sub = line.data();
-#if defined(__x86_64__)
-    if constexpr (N == 4) {
-      if (avx2) {
-        rowRun4(add, sub, row, w, sum, inv);
-        continue;
-      }
-    }
-#endif
-    for (int x = 0; x < w; ++x) {
-      for (int k = 0; k < N; ++k) {
-        row[(size_t)x * N + k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);
-        sum[k] += (uint32_t)add[k] - (uint32_t)sub[k];
-      }
-      add += N;
-      sub += N;
-    }
+    for (int i = 0; i < r; ++i) std::memcpy(&line[(size_t)i * N], row, N);
+    std::memcpy(&line[(size_t)r * N], row, (size_t)w * N);
+    for (int i = r + w; i < w + 2 * r + 1; ++i)
+      std::memcpy(&line[(size_t)i * N], row + (size_t)(w - 1) * N, N);
+    boxRow(line.data(), row, w * N, r, N);
   }
 }
 
@@ -242,33 +269,32 @@ template <int N>
 void blurColumns(Image<N>& img, int r, Image<N>& out) {
   const int w = img.w, h = img.h;
   const size_t n = (size_t)w * N;
-  // sum x inv stays below 2^32: sum <= 255 (2r + 1) and inv <= 2^24 / (2r + 1).
-  const uint32_t inv = (1u << 24) / (uint32_t)(2 * r + 1);
-#if defined(__x86_64__)
-  const bool avx2 = simdAvx2();
-#endif
+  const uint32_t inv = boxInverse(r);
   out.resize(w, h);
   std::vector<uint32_t> sum(n, 0u);
   for (int i = -r; i <= r; ++i) {
     const uint8_t* s = img.row(std::clamp(i, 0, h - 1));
     for (size_t k = 0; k < n; ++k) sum[k] += s[k];
   }
-  for (int y = 0; y < h; ++y) {
-    uint8_t* d = out.row(y);
-    const uint8_t* add = img.row(std::min(y + r + 1, h - 1));
-    const uint8_t* sub = img.row(std::max(y - r, 0));
-    size_t k = 0;
-#if defined(__x86_64__)
-    if (avx2) k = columnsRowAvx2(sum.data(), add, sub, d, n, inv);
-#endif
-    for (; k < n; ++k) {
-      d[k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);
-      sum[k] += (uint32_t)add[k] - (uint32_t)sub[k];
-    }
-  }
+  for (int y = 0; y < h; ++y)
+    boxColumnStep(sum.data(), img.row(std::min(y + r + 1, h - 1)), img.row(std::max(y - r, 0)), out.row(y), n,
+                  inv);
 }
 
 }  // namespace
+
+void boxColumnStep(uint32_t* sum, const uint8_t* add, const uint8_t* sub, uint8_t* out, size_t n,
+                   uint32_t inv) {
+  // sum x inv stays below 2^32: sum <= 255 (2r + 1) and inv <= 2^24 / (2r + 1).
+  size_t k = 0;
+#if defined(__x86_64__)
+  if (simdAvx2()) k = columnsRowAvx2(sum, add, sub, out, n, inv);
+#endif
+  for (; k < n; ++k) {
+    out[k] = (uint8_t)((sum[k] * inv + (1u << 23)) >> 24);
+    sum[k] += (uint32_t)add[k] - (uint32_t)sub[k];
+  }
+}
 
 template <int N>
 void boxBlur(Image<N>& img, int radius, int passes) {
@@ -322,29 +348,63 @@ Upsampler<N>::Upsampler(const Image<N>& small, int factor, int fullWidth, int)
       mFactor(factor),
       mWidth(fullWidth),
       mX0((size_t)fullWidth),
-      mWx((size_t)fullWidth),
+      mX1((size_t)fullWidth),
+      mWx((size_t)fullWidth * N),
       mWide0((size_t)fullWidth * N),
       mWide1((size_t)fullWidth * N),
       mOut((size_t)fullWidth * N) {
   for (int x = 0; x < fullWidth; ++x) {
     double u = (x + 0.5) / factor - 0.5;
     u = std::clamp(u, 0.0, (double)(small.w - 1));
-    int x0 = std::min((int)u, small.w - 1);
+    const int x0 = std::min((int)u, small.w - 1);
     mX0[(size_t)x] = x0;
-    mWx[(size_t)x] = (uint16_t)std::lround((u - x0) * 256.0);
+    mX1[(size_t)x] = std::min(x0 + 1, small.w - 1);
+    const uint16_t wx = (uint16_t)std::lround((u - x0) * 256.0);
+    for (int k = 0; k < N; ++k) mWx[(size_t)x * N + k] = wx;
   }
 }
+
+#if defined(__x86_64__)
+// Eight four-channel pixels per step: both neighbours gathered, then the
+// 8.8 mix in 16-bit lanes (it stays below 2^16, so wrapping products are exact).
+__attribute__((target("avx2"))) int widen4Avx2(const uint8_t* s, const int* x0, const int* x1,
+                                               const uint16_t* wx, uint16_t* out, int width) {
+  const int* px = reinterpret_cast<const int*>(s);
+  const __m256i k256 = _mm256_set1_epi16(256);
+  int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const __m256i p =
+        _mm256_i32gather_epi32(px, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(x0 + x)), 4);
+    const __m256i q =
+        _mm256_i32gather_epi32(px, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(x1 + x)), 4);
+    for (int half = 0; half < 2; ++half) {
+      const __m128i p4 = half ? _mm256_extracti128_si256(p, 1) : _mm256_castsi256_si128(p);
+      const __m128i q4 = half ? _mm256_extracti128_si256(q, 1) : _mm256_castsi256_si128(q);
+      const size_t at = (size_t)(x + 4 * half) * 4;
+      const __m256i wq = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(wx + at));
+      const __m256i mixed =
+          _mm256_add_epi16(_mm256_mullo_epi16(_mm256_cvtepu8_epi16(p4), _mm256_sub_epi16(k256, wq)),
+                           _mm256_mullo_epi16(_mm256_cvtepu8_epi16(q4), wq));
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + at), mixed);
+    }
+  }
+  return x;
+}
+#endif
 
 template <int N>
 void Upsampler<N>::widen(int sy, uint16_t* out) const {
   const uint8_t* s = mSmall.row(sy);
-  const int lastX = mSmall.w - 1;
-  for (int x = 0; x < mWidth; ++x) {
-    const int x0 = mX0[(size_t)x];
-    const int x1 = x0 < lastX ? x0 + 1 : x0;
-    const uint32_t wx = mWx[(size_t)x];
-    const uint8_t* p = s + (size_t)x0 * N;
-    const uint8_t* q = s + (size_t)x1 * N;
+  int x = 0;
+#if defined(__x86_64__)
+  if constexpr (N == 4) {
+    if (simdAvx2()) x = widen4Avx2(s, mX0.data(), mX1.data(), mWx.data(), out, mWidth);
+  }
+#endif
+  for (; x < mWidth; ++x) {
+    const uint8_t* p = s + (size_t)mX0[(size_t)x] * N;
+    const uint8_t* q = s + (size_t)mX1[(size_t)x] * N;
+    const uint32_t wx = mWx[(size_t)x * N];
     for (int k = 0; k < N; ++k) out[(size_t)x * N + k] = (uint16_t)(p[k] * (256u - wx) + q[k] * wx);
   }
 }

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "platform/image-filter/filter_frame.h"
+#include "platform/image-filter/filter_scratch.h"
 
 namespace imgfilter {
 
@@ -15,11 +16,12 @@ template <int N>
 struct Image {
   int w = 0;
   int h = 0;
-  std::vector<uint8_t> px;
+  ScratchBlock px;
+  // All pixels zero.
   void resize(int width, int height) {
     w = width;
     h = height;
-    px.assign((size_t)width * (size_t)height * N, 0);
+    px.assignZero((size_t)width * (size_t)height * N);
   }
   uint8_t* row(int y) { return px.data() + (size_t)y * (size_t)w * N; }
   const uint8_t* row(int y) const { return px.data() + (size_t)y * (size_t)w * N; }
@@ -32,8 +34,20 @@ int reductionFor(int shortSide, int target);
 
 // Averages factor x factor blocks of the frame's source into R, G, B, A order.
 void downscale(const Frame& f, int factor, Rgba& out);
-// Luma of the frame's source, averaged over factor x factor blocks.
-void downscaleLuma(const Frame& f, int factor, Gray& out);
+// Luma of row y of the frame's source.
+void lumaRow(const Frame& f, int y, uint8_t* out);
+
+// Box passes round like this: out = (sum * boxInverse(r) + 2^23) >> 24.
+uint32_t boxInverse(int radius);
+// One row of a horizontal box of radius r over pixels of `step` bytes:
+// out[i] averages line[i + k step] for k = 0 .. 2r. The line is the row
+// padded with r copies of its edge pixel at each end; count + (2r + 1) step
+// bytes must be readable.
+void boxRow(const uint8_t* line, uint8_t* out, int count, int radius, int step);
+// One output row of a vertical box pass over n bytes: out from the window
+// sums, then the window moves down a row (sum += add - sub).
+void boxColumnStep(uint32_t* sum, const uint8_t* add, const uint8_t* sub, uint8_t* out, size_t n,
+                   uint32_t inv);
 
 // `passes` horizontal and vertical box passes of the given radius; three
 // passes give a close approximation of a Gaussian.
@@ -58,7 +72,10 @@ class Upsampler {
   const Image<N>& mSmall;
   int mFactor;
   int mWidth;
+  // Per full column: the two reduced columns it lies between, and the 8.8
+  // weight of the second, repeated for each of the N bytes.
   std::vector<int> mX0;
+  std::vector<int> mX1;
   std::vector<uint16_t> mWx;
   // The two widened reduced rows the current full rows lie between.
   int mRow0 = -1;

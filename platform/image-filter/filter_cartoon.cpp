@@ -1,4 +1,4 @@
-// Detail and drawing looks: sharpening and the cartoon drawing.
+// The cartoon drawing look.
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
@@ -9,40 +9,6 @@
 #include "platform/image-filter/filter_simd.h"
 
 namespace imgfilter {
-
-void lookSharpen(const Frame& f) {
-  // Unsharp mask on luma: the detail (luma minus its small blur) is added to
-  // every channel, so colours do not fringe. Differences within the noise
-  // threshold are left alone, and the boost is capped so edges get no halos.
-  Gray luma, blur;
-  downscaleLuma(f, 1, luma);
-  blur = luma;
-  boxBlur(blur, std::max(1, (int)std::lround(f.shortSide() / 1500.0)), 1);
-  constexpr int kThreshold = 2;
-  constexpr int kAmount = 420;  // 8.8 fixed point: x 1.64
-  constexpr int kCap = 44;
-  int8_t boost[511];
-  for (int i = -255; i <= 255; ++i) {
-    int d = std::abs(i) <= kThreshold ? 0 : (i > 0 ? i - kThreshold : i + kThreshold);
-    boost[i + 255] = (int8_t)std::clamp((d * kAmount) >> 8, -kCap, kCap);
-  }
-  dispatchOrder(f.ch, [&](auto order) {
-    constexpr Channels c = decltype(order)::ch;
-    for (int y = 0; y < f.height; ++y) {
-      const uint8_t* s = f.srcRow(y);
-      uint8_t* d = f.dstRow(y);
-      const uint8_t* l = luma.row(y);
-      const uint8_t* b = blur.row(y);
-      for (int x = 0; x < f.width; ++x, s += 4, d += 4) {
-        const int k = boost[l[x] - b[x] + 255];
-        const uint32_t px = load32(s);
-        const int r = chan(px, c.r), g = chan(px, c.g), bl = chan(px, c.b);
-        store32(d, put((uint8_t)clamp255(r + k), c.r) | put((uint8_t)clamp255(g + k), c.g) |
-                       put((uint8_t)clamp255(bl + k), c.b) | (px & put(255, c.a)));
-      }
-    }
-  });
-}
 
 namespace {
 
