@@ -27,7 +27,6 @@
 #include <vector>
 
 #include "codec/BitmapFactory.h"
-#include "common/CLyAppData.h"
 #include "model/CLyImageDecoderThread.h"
 #include "model/ILyMultiGridListener.h"
 #include "tests/codec/TestImages.h"
@@ -160,12 +159,6 @@ int main(int argc, char** argv) {
   const std::string mode = argv[1];
   if (mode == "gen") return gen(argv[2]);
   if (mode == "seeds") return seeds(argv[2]);
-  // The application data (whose lock serialises PNG decoding) is made on the
-  // main thread before any decoder thread needs it; JPEG decoding never does.
-  for (int i = 2; i < argc; ++i) {
-    const std::string f = argv[i];
-    if (f.size() > 4 && f.compare(f.size() - 4, 4, ".png") == 0) CLyAppData::getInstance();
-  }
   if (mode == "mem") {
     // Touch everything a decode needs once on a tiny image, so the rise is the decode's own.
     const long before = maxRssKb();

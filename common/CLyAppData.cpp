@@ -25,18 +25,15 @@ struct _CLyAppDataImpl {
   Uxt_Theme_Color_Table* colorTable = nullptr;
   Uxt_Theme_Font_Table* fontTable = nullptr;
   bool themeExtension = false;
-  pthread_mutex_t mutex;
 };
 
 CLyAppData::CLyAppData() : _pv(new _CLyAppDataImpl) {
   int ret = feedback_initialize();
   if (ret != 0) LYLOG_E("feedback_initialize error : %d", ret);
   CLyUtil::initResourceManager();
-  pthread_mutex_init(&_pv->mutex, nullptr);
 }
 
 CLyAppData::~CLyAppData() {
-  pthread_mutex_destroy(&_pv->mutex);
   if (_pv->themeExtension) {
     if (char* path = CLyUtil::getEdjPath(LY_THEME_EDJ)) {
       elm_theme_extension_del(nullptr, path);
@@ -170,14 +167,4 @@ void CLyAppData::setTextDomain() {
   bindtextdomain(LY_TEXT_DOMAIN, locale.c_str());
   bind_textdomain_codeset(LY_TEXT_DOMAIN, "UTF-8");
   free(res);
-}
-
-void CLyAppData::lock() {
-  int ret = pthread_mutex_lock(&_pv->mutex);
-  if (ret != 0) LYLOG_E("Mutex error occur [%d],[%s]", ret, strerror(ret));
-}
-
-void CLyAppData::unlock() {
-  int ret = pthread_mutex_unlock(&_pv->mutex);
-  if (ret != 0) LYLOG_E("Mutex error occur [%d],[%s]", ret, strerror(ret));
 }

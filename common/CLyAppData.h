@@ -34,9 +34,10 @@ class CLyAppData : public CLySingleton<CLyAppData> {
   Uxt_Theme_Font_Table* getFontTable();
   void setTextDomain();
 
-  // The process-wide mutex; not recursive.
-  void lock();
-  void unlock();
+  // The process-wide mutex; not recursive. It needs none of the other data,
+  // so taking it never builds the instance (common/CLyAppDataLock.cpp).
+  static void lock();
+  static void unlock();
 
  private:
   friend class CLySingleton<CLyAppData>;

@@ -118,7 +118,7 @@ void CLyImageDecoderThread::run() {
   Bitmap* bitmap = nullptr;
   if (header.imageType == IMAGE_TYPE_PNG) {
     // The PNG path is serialised across all decoder threads.
-    CLyAppData::getInstance()->lock();
+    CLyAppData::lock();
     DecodeOptions options;
     options.colorFormat = BITMAP_FORMAT_BGRA;
     int result = BitmapFactory::initPNGFile(options, mPath);
@@ -134,7 +134,7 @@ void CLyImageDecoderThread::run() {
         bitmap = nullptr;
       }
     }
-    CLyAppData::getInstance()->unlock();
+    CLyAppData::unlock();
   } else {
     DecodeOptions options;
     options.colorFormat = BITMAP_FORMAT_BGRA;
