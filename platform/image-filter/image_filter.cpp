@@ -3,6 +3,7 @@
 #include <new>
 
 #include "platform/core/dlog.h"
+#include "platform/core/pixel_order.h"
 #include "platform/image-filter/filter_looks.h"
 
 #define IF_TAG "IMAGE_FILTER"
@@ -167,16 +168,6 @@ bool channelsOf(tbm_format format, imgfilter::Channels* ch) {
   return false;
 }
 
-void reversePixels(unsigned char* row, int width) {
-  for (int x = 0; x < width; ++x, row += 4) {
-    unsigned char t0 = row[0], t1 = row[1];
-    row[0] = row[3];
-    row[1] = row[2];
-    row[2] = t1;
-    row[3] = t0;
-  }
-}
-
 int applySurfaces(_image_filter_s* h) {
   if (!h->inSurface || !h->outSurface) {
     dlog_print(DLOG_ERROR, IF_TAG, "image_filter_apply: input or output surface missing");
@@ -213,7 +204,7 @@ int applySurfaces(_image_filter_s* h) {
   imgfilter::runLook(h->code, f);
   // The looks write in the input's channel order; turn it into the output's.
   if (inCh.a != outCh.a)
-    for (int y = 0; y < hgt; ++y) reversePixels(f.dstRow(y), w);
+    for (int y = 0; y < hgt; ++y) pixel_order::copyReversed(f.dstRow(y), f.dstRow(y), (size_t)w);
   if (!same) tbm_surface_unmap(h->outSurface);
   tbm_surface_unmap(h->inSurface);
   return IMAGE_FILTER_ERROR_NONE;
