@@ -8,10 +8,12 @@ namespace imgfilter {
 
 namespace {
 
-// A few blocks per thread, none larger than a 4000 x 2000 four-channel
-// image, so the cache never holds more than a look's own working set.
+// A few blocks per thread, none larger than a 2000 x 2000 four-channel
+// image, and 48 MB at most in all: about one look's working set on an
+// editing-size photo, never more.
 constexpr size_t kMaxBlocks = 6;
-constexpr size_t kMaxBlockBytes = 32u << 20;
+constexpr size_t kMaxBlockBytes = 16u << 20;
+constexpr size_t kMaxCachedBytes = 48u << 20;
 
 struct Block {
   std::unique_ptr<uint8_t[]> data;
@@ -47,6 +49,12 @@ void ScratchBlock::swap(ScratchBlock& other) noexcept {
   std::swap(mCapacity, other.mCapacity);
 }
 
+size_t ScratchBlock::cachedBytes() {
+  size_t total = 0;
+  for (const Block& b : cache()) total += b.capacity;
+  return total;
+}
+
 void ScratchBlock::assignZero(size_t n) {
   if (n > mCapacity) {
     release();
@@ -73,14 +81,18 @@ void ScratchBlock::release() {
   if (!mData) return;
   auto& blocks = cache();
   if (mCapacity <= kMaxBlockBytes) {
-    if (blocks.size() == kMaxBlocks) {
-      // Keep the larger blocks: they are the ones that cost page faults.
+    // Make room by dropping smaller blocks: the larger ones are those whose
+    // page faults cost most.
+    auto cached = [] { return cachedBytes(); };
+    while (!blocks.empty() && (blocks.size() == kMaxBlocks || cached() + mCapacity > kMaxCachedBytes)) {
       size_t smallest = 0;
       for (size_t i = 1; i < blocks.size(); ++i)
         if (blocks[i].capacity < blocks[smallest].capacity) smallest = i;
-      if (blocks[smallest].capacity < mCapacity) blocks.erase(blocks.begin() + (std::ptrdiff_t)smallest);
+      if (blocks[smallest].capacity >= mCapacity) break;
+      blocks.erase(blocks.begin() + (std::ptrdiff_t)smallest);
     }
-    if (blocks.size() < kMaxBlocks) blocks.push_back({std::move(mData), mCapacity});
+    if (blocks.size() < kMaxBlocks && cached() + mCapacity <= kMaxCachedBytes)
+      blocks.push_back({std::move(mData), mCapacity});
   }
   mData.reset();
   mSize = 0;

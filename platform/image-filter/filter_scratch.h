@@ -26,6 +26,9 @@ class ScratchBlock {
   size_t size() const { return mSize; }
   void swap(ScratchBlock& other) noexcept;
 
+  // Bytes the calling thread keeps cached for reuse.
+  static size_t cachedBytes();
+
  private:
   void release();
 

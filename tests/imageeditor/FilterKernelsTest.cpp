@@ -197,3 +197,18 @@ TEST(FilterKernels, ReusedWorkingMemoryStartsZeroedOnEveryThread) {
   for (auto& t : threads) t.join();
   for (size_t i = 0; i < ok.size(); ++i) EXPECT_TRUE(ok[i]) << "thread " << i;
 }
+
+TEST(FilterKernels, WorkingMemoryCacheStaysWithinItsBounds) {
+  {
+    std::vector<Image<4>> images(8);
+    for (auto& img : images) img.resize(1600, 1600);  // about 10 MB each
+  }
+  EXPECT_GT(ScratchBlock::cachedBytes(), 0u);
+  EXPECT_LE(ScratchBlock::cachedBytes(), size_t{48} << 20);
+  const size_t before = ScratchBlock::cachedBytes();
+  {
+    Image<4> huge;
+    huge.resize(3000, 2000);  // 24 MB: too large to keep
+  }
+  EXPECT_EQ(ScratchBlock::cachedBytes(), before);
+}
