@@ -71,10 +71,6 @@ Bitmap* createUnclearedBitmap(int width, int height, int format) {
 }
 }  // namespace
 
-unsigned char* allocLarge(size_t size, bool zero) {
-  return allocPixels(size, zero);
-}
-
 bool imageSizeAcceptable(long long width, long long height) {
   return width > 0 && height > 0 && width <= kMaxImageSide && height <= kMaxImageSide &&
          width * height <= kMaxImagePixels;

@@ -36,11 +36,6 @@ bool decodeGif(FILE* file, int outW, int outH, uint8_t* out);
 bool decodeBmp(FILE* file, int outW, int outH, uint8_t* out);
 bool decodeWbmp(FILE* file, int outW, int outH, uint8_t* out);
 
-// A buffer freed with free(); from a few MiB on it asks for transparent huge
-// pages, so that its first write costs a fault per 2 MiB, not per 4 KiB.
-// `zero`: cleared. Null when memory runs out.
-unsigned char* allocLarge(size_t size, bool zero);
-
 // Pixel helpers shared by the decoders.
 void premultiplyRow(uint8_t* bgra, int width);
 // Turns a w x h premultiplied BGRA buffer into `format` in `dst` (which may

@@ -13,6 +13,8 @@
 #include <new>
 
 #include <jpeglib.h>
+// After jpeglib.h, which it needs.
+#include <jerror.h>
 
 #include "codec/CodecLog.h"
 #include "codec/ImageDecoders.h"
@@ -28,8 +30,14 @@ constexpr int kMaxScans = 500;
 // Working memory libjpeg may take (the coefficient buffer of a progressive
 // image is the large part: about 72 MB for 24 MP at 4:2:0).
 constexpr long kMaxDecoderMemory = 400L * 1024 * 1024;
-// Files up to this size are read into memory whole before decoding.
-constexpr off_t kMaxWholeFile = 32L * 1024 * 1024;
+// The file is read in chunks of this size: libjpeg-turbo's fast Huffman
+// decoder runs only while a few kilobytes of data lie ahead in its buffer,
+// which the 4 KiB of libjpeg's own stdio source allow for a quarter of the
+// time and a chunk this large almost always. Reading the whole file instead
+// would cost fresh memory as large as the file for every photo decoded at
+// once. Read, not mapped: a file cut short by another program while it is
+// decoded must give an error, not SIGBUS.
+constexpr size_t kChunkBytes = 256 * 1024;
 
 struct ErrorManager {
   jpeg_error_mgr pub;
@@ -58,6 +66,48 @@ void progress(j_common_ptr cinfo) {
   }
 }
 
+// libjpeg's stdio source with a larger buffer.
+struct ChunkSource {
+  jpeg_source_mgr pub;
+  FILE* file = nullptr;
+  JOCTET* buffer = nullptr;
+  size_t capacity = 0;
+  bool atStart = true;
+};
+
+void initSource(j_decompress_ptr) {}
+void termSource(j_decompress_ptr) {}
+
+boolean fillInputBuffer(j_decompress_ptr cinfo) {
+  auto* src = reinterpret_cast<ChunkSource*>(cinfo->src);
+  size_t n = fread(src->buffer, 1, src->capacity, src->file);
+  if (n == 0) {
+    if (src->atStart) ERREXIT(cinfo, JERR_INPUT_EMPTY);
+    // A file cut short: end it with an EOI marker, so the rows missing come
+    // out blank instead of the decoder reading on.
+    WARNMS(cinfo, JWRN_JPEG_EOF);
+    src->buffer[0] = 0xFF;
+    src->buffer[1] = JPEG_EOI;
+    n = 2;
+  }
+  src->pub.next_input_byte = src->buffer;
+  src->pub.bytes_in_buffer = n;
+  src->atStart = false;
+  return TRUE;
+}
+
+void skipInputData(j_decompress_ptr cinfo, long count) {
+  if (count <= 0) return;
+  jpeg_source_mgr* src = cinfo->src;
+  size_t left = static_cast<size_t>(count);
+  while (left > src->bytes_in_buffer) {
+    left -= src->bytes_in_buffer;
+    fillInputBuffer(cinfo);
+  }
+  src->next_input_byte += left;
+  src->bytes_in_buffer -= left;
+}
+
 // Everything that must be released after a longjmp lives here, on the heap,
 // so that no C++ object with a destructor is skipped over.
 struct JpegJob {
@@ -68,11 +118,10 @@ struct JpegJob {
   Resampler* resampler = nullptr;
   uint8_t* rows = nullptr;
   uint8_t* converted = nullptr;
-  unsigned char* data = nullptr;  // the whole file, when it could be read at once
-  size_t dataSize = 0;
+  ChunkSource source;
   ~JpegJob() {
     if (created) jpeg_destroy_decompress(&cinfo);
-    free(data);
+    free(source.buffer);
     delete resampler;
     free(rows);
     free(converted);
@@ -88,10 +137,20 @@ void setUp(JpegJob& job, FILE* file) {
   job.cinfo.mem->max_memory_to_use = kMaxDecoderMemory;
   job.progress.progress_monitor = progress;
   job.cinfo.progress = &job.progress;
-  if (job.data)
-    jpeg_mem_src(&job.cinfo, job.data, static_cast<unsigned long>(job.dataSize));
-  else
+  ChunkSource& src = job.source;
+  if (!src.buffer) {
     jpeg_stdio_src(&job.cinfo, file);
+    return;
+  }
+  src.file = file;
+  src.pub.init_source = initSource;
+  src.pub.fill_input_buffer = fillInputBuffer;
+  src.pub.skip_input_data = skipInputData;
+  src.pub.resync_to_restart = jpeg_resync_to_restart;
+  src.pub.term_source = termSource;
+  src.pub.bytes_in_buffer = 0;
+  src.pub.next_input_byte = nullptr;
+  job.cinfo.src = &src.pub;
 }
 
 // Adobe CMYK/YCCK files store inverted inks; K scales the other three.
@@ -131,23 +190,17 @@ bool readJpegSize(FILE* file, long long& width, long long& height) {
 bool decodeJpeg(FILE* file, int outW, int outH, uint8_t* out) {
   JpegJob* job = new (std::nothrow) JpegJob();
   if (!job) return false;
-  // The whole file in memory at once: libjpeg-turbo's fast Huffman decoder
-  // runs only while a few kilobytes of data lie ahead in its buffer, which a
-  // 4 KiB stdio buffer allows for a quarter of the time and a whole file
-  // always. Read, not mapped: a file cut short by another program while it
-  // is decoded must give an error, not SIGBUS. Reading through stdio stays
-  // the fallback (memory short, a file that is not what fstat said).
+  // A small file needs no buffer larger than itself.
   struct stat st {};
-  if (fstat(fileno(file), &st) == 0 && st.st_size > 0 && st.st_size <= kMaxWholeFile && ftell(file) == 0) {
-    const size_t size = static_cast<size_t>(st.st_size);
-    job->data = allocLarge(size, false);
-    if (job->data && fread(job->data, 1, size, file) == size) {
-      job->dataSize = size;
-    } else {
-      free(job->data);
-      job->data = nullptr;
-      rewind(file);
-    }
+  size_t capacity = kChunkBytes;
+  if (fstat(fileno(file), &st) == 0 && st.st_size > 0 && static_cast<size_t>(st.st_size) < capacity)
+    capacity = static_cast<size_t>(st.st_size) + 2;  // room for the EOI a short file is given
+  job->source.buffer = static_cast<JOCTET*>(malloc(capacity));
+  job->source.capacity = capacity;
+  if (!job->source.buffer) {
+    IVLOG_E("no memory to read the file");
+    delete job;
+    return false;
   }
   volatile bool ok = false;
   if (setjmp(job->err.jump) == 0) {
