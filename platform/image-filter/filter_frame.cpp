@@ -1,15 +1,34 @@
 #include "platform/image-filter/filter_frame.h"
 
+#include <atomic>
 #include <cstdlib>
 
 namespace imgfilter {
 
-bool simdAvx2() {
+namespace {
+
+bool avx2Allowed() {
 #if defined(__x86_64__)
   return __builtin_cpu_supports("avx2") && !getenv("PICTAVO_FILTER_NO_SIMD");
 #else
   return false;
 #endif
+}
+
+// Read once per look, not in the kernels, which ask for every row.
+std::atomic<bool>& avx2Choice() {
+  static std::atomic<bool> choice{avx2Allowed()};
+  return choice;
+}
+
+}  // namespace
+
+bool simdAvx2() {
+  return avx2Choice().load(std::memory_order_relaxed);
+}
+
+void chooseSimd() {
+  avx2Choice().store(avx2Allowed(), std::memory_order_relaxed);
 }
 
 GrainTile::GrainTile(uint64_t seed, int amp) : mTile(256 * 256) {

@@ -83,9 +83,11 @@ inline int luma709(int r, int g, int b) {
 }
 
 // True when the AVX2 kernels may run: the processor has AVX2 and
-// PICTAVO_FILTER_NO_SIMD is not set (tests compare both paths, which must
-// give the same bytes).
+// PICTAVO_FILTER_NO_SIMD was not set when chooseSimd() last looked (tests
+// compare both paths, which must give the same bytes).
 bool simdAvx2();
+// Looks at PICTAVO_FILTER_NO_SIMD again; every look starts with it.
+void chooseSimd();
 
 // Small, fast, seeded generator: every look that needs randomness seeds its
 // own, so results never depend on threads or on earlier calls.

@@ -77,6 +77,7 @@ bool isKnownCode(int code) {
 
 bool runLook(int code, const Frame& f) {
   if (!isKnownCode(code)) return false;
+  chooseSimd();
   switch (code) {
     case 422:
       lookPastel(f);

@@ -22,8 +22,10 @@ template <typename Fn>
 void withAndWithoutSimd(Fn fn) {
   fn();
   setenv("PICTAVO_FILTER_NO_SIMD", "1", 1);
+  chooseSimd();
   fn();
   unsetenv("PICTAVO_FILTER_NO_SIMD");
+  chooseSimd();
 }
 
 Frame frameOf(const std::vector<uint8_t>& src, std::vector<uint8_t>& dst, int w, int h, Channels ch) {
