@@ -143,7 +143,8 @@ void downscale(const Frame& f, int factor, Rgba& out) {
 namespace {
 
 #if defined(__x86_64__)
-// Sixteen 32-bit values 0..255 (two vectors of eight) stored as sixteen bytes.
+// Sixteen 32-bit values 0..255 (two vectors of eight) stored as sixteen
+// bytes: packed to 16-bit, then to bytes, with the lane order fixed.
 __attribute__((target("avx2"))) inline void storeBytes16(uint8_t* out, __m256i lo, __m256i hi) {
   const __m256i p16 = _mm256_permute4x64_epi64(_mm256_packus_epi32(lo, hi), 0xD8);
   _mm_storeu_si128(reinterpret_cast<__m128i*>(out),
@@ -331,10 +332,7 @@ __attribute__((target("avx2"))) size_t blendRowsAvx2(const uint16_t* a, const ui
     __m256i r1 = _mm256_add_epi32(_mm256_mullo_epi32(a1, wa), _mm256_mullo_epi32(b1, wb));
     r0 = _mm256_srli_epi32(_mm256_add_epi32(r0, round), 16);
     r1 = _mm256_srli_epi32(_mm256_add_epi32(r1, round), 16);
-    // 16 values 0..255: pack to 16-bit, then to bytes, fixing the lane order.
-    const __m256i p16 = _mm256_permute4x64_epi64(_mm256_packus_epi32(r0, r1), 0xD8);
-    const __m128i p8 = _mm_packus_epi16(_mm256_castsi256_si128(p16), _mm256_extracti128_si256(p16, 1));
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(out + k), p8);
+    storeBytes16(out + k, r0, r1);
   }
   return k;
 }
